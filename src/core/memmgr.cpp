@@ -1,0 +1,112 @@
+// The bump arena: blocks of 0x100000 bytes from malloc, rewound per translation unit.
+#include <zoa/memmgr.h>
+
+#include <cstdint>
+#include <cstdlib>
+#include <iterator>
+#include <list>
+#include <new>
+
+namespace ZOA {
+namespace {
+
+struct Arena {
+    std::list<char*> memBlkPtrs;                  // every block, in the order obtained
+    std::list<char*>::iterator currentMemBlkPtr;  // the block being filled
+    char* next = nullptr;                         // first free byte of the current block
+    char* end = nullptr;                          // one past the current block
+    std::list<void*> oversized;                   // dedicated blocks of large requests
+};
+
+// Never destroyed: blocks stay reachable (and are never freed) until the process ends.
+Arena& arena() {
+    static Arena* a = new Arena;
+    return *a;
+}
+
+char* obtainBlock(std::size_t size) {
+    void* p = std::malloc(size);
+    if (!p) throw std::bad_alloc();
+    return static_cast<char*>(p);
+}
+
+void enterBlock(Arena& a) {
+    a.next = *a.currentMemBlkPtr;
+    a.end = a.next + MemMgr::BLOCK_SIZE;
+}
+
+// Moves to the next block (reusing one obtained earlier) and returns its start.
+char* advanceBlock(Arena& a) {
+    if (a.memBlkPtrs.empty()) {
+        MemMgr::rewind();
+        return a.next;
+    }
+    ++a.currentMemBlkPtr;
+    if (a.currentMemBlkPtr == a.memBlkPtrs.end()) {
+        a.memBlkPtrs.push_back(obtainBlock(MemMgr::BLOCK_SIZE));
+        a.currentMemBlkPtr = std::prev(a.memBlkPtrs.end());
+    }
+    enterBlock(a);
+    return a.next;
+}
+
+void* allocateOversized(Arena& a, std::size_t size) {
+    a.oversized.push_back(nullptr);  // reserve the list cell first: no leak if malloc throws
+    void* p = obtainBlock(size);
+    a.oversized.back() = p;
+    return p;
+}
+
+}  // namespace
+
+void MemMgr::rewind() {
+    Arena& a = arena();
+    if (a.memBlkPtrs.empty()) a.memBlkPtrs.push_back(obtainBlock(BLOCK_SIZE));
+    for (void* p : a.oversized) std::free(p);
+    a.oversized.clear();
+    a.currentMemBlkPtr = a.memBlkPtrs.begin();
+    enterBlock(a);
+}
+
+void* MemMgr::allocate(unsigned int size) {
+    Arena& a = arena();
+    if (size > BLOCK_SIZE) return allocateOversized(a, size);
+    if (a.next && static_cast<std::size_t>(a.end - a.next) >= size) {
+        char* p = a.next;
+        a.next += size;
+        return p;
+    }
+    char* p = advanceBlock(a);
+    a.next = p + size;
+    return p;
+}
+
+void* MemMgr::allocateAligned(std::size_t size, std::size_t align) {
+    Arena& a = arena();
+    if (size > BLOCK_SIZE) return allocateOversized(a, size);
+    if (a.next) {
+        std::uintptr_t at = reinterpret_cast<std::uintptr_t>(a.next);
+        std::size_t pad = (align - at % align) % align;
+        if (static_cast<std::size_t>(a.end - a.next) >= pad + size) {
+            char* p = a.next + pad;
+            a.next = p + size;
+            return p;
+        }
+    }
+    // Block starts come from malloc and are aligned for every fundamental type.
+    char* p = advanceBlock(a);
+    a.next = p + size;
+    return p;
+}
+
+void MemMgr::deallocate(void*, unsigned int) {}
+
+unsigned int MemMgr::getMemoryUsage() {
+    Arena& a = arena();
+    if (a.memBlkPtrs.empty()) return 0u - 1u;
+    unsigned int used = static_cast<unsigned int>(a.next - *a.currentMemBlkPtr);
+    unsigned int index = static_cast<unsigned int>(std::distance(a.memBlkPtrs.begin(), a.currentMemBlkPtr));
+    return used + index - 1u;
+}
+
+}  // namespace ZOA

@@ -1,0 +1,41 @@
+// Node and annotation bases: arena allocation, annotations, type sizes.
+#include <zoa/tree_base.h>
+#include <zoa/visitor.h>
+
+namespace ZOA {
+
+namespace {
+// Nodes hold pointers, 64-bit integers and doubles.
+constexpr std::size_t NODE_ALIGN = alignof(std::max_align_t) < 8 ? alignof(std::max_align_t) : 8;
+}  // namespace
+
+TreeAnnotation::~TreeAnnotation() {}
+
+void* TreeAnnotation::operator new(std::size_t size) { return MemMgr::allocateAligned(size, NODE_ALIGN); }
+
+void* TreeBase::operator new(std::size_t size) { return MemMgr::allocateAligned(size, NODE_ALIGN); }
+
+void TreeBase::setAnnotation(TreeAnnotation* a, bool deleteOld) {
+    if (deleteOld && annotation) delete annotation;
+    annotation = a;
+}
+
+unsigned int ExprBase::sizeOfDataType(DataType t) {
+    switch (t) {
+    case CHAR_U:
+    case CHAR_S: return 1;
+    case INT_U:
+    case INT_S:
+    case FLOAT:
+    case POINTER: return 4;
+    case INT64_U:
+    case INT64_S:
+    case DOUBLE: return 8;
+    case VOID: return 0;
+    }
+    return 0;
+}
+
+VisitorBase::~VisitorBase() {}
+
+}  // namespace ZOA

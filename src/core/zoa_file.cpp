@@ -1,0 +1,66 @@
+// ZOA_file: construction, subprograms, file-level names and prototypes.
+#include <zoa/zoa_file.h>
+
+namespace ZOA {
+
+ZOA_file::ZOA_file(bool isGcc, bool asmMode) : isGcc(isGcc), asmMode(asmMode) { MemMgr::rewind(); }
+
+ZOA_file::~ZOA_file() {}
+
+unsigned int ZOA_file::getMemoryUsage() { return MemMgr::getMemoryUsage(); }
+
+SUBPROG* ZOA_file::createSubprog(DataType returnType, const char* name, bool addPrototype) {
+    SUBPROG* sp = new SUBPROG(returnType, name);
+    subprogs.push_back(sp);
+    if (addPrototype) addFunctionPrototype(sp);
+    return sp;
+}
+
+bool ZOA_file::needsPrototype(const std::string& name) const {
+    for (SUBPROG* sp : subprogs) {
+        const String& n = sp->getName();
+        if (n.size() == name.size() && n.compare(0, n.size(), name.data(), name.size()) == 0) return false;
+    }
+    return true;
+}
+
+void ZOA_file::addFunctionPrototype(CALL* call) {
+    if (!call) return;
+    std::string name(call->getFunctionName().data(), call->getFunctionName().size());
+    if (needsPrototype(name)) callPrototypes[name] = call;
+}
+
+void ZOA_file::addFunctionPrototype(SUBPROG* sp) {
+    subprogPrototypes[std::string(sp->getName().data(), sp->getName().size())] = sp;
+}
+
+void ZOA_file::addFunctionPrototype(NAME* n) {
+    std::string text(n->getStringValue().data(), n->getStringValue().size());
+    if (needsPrototype(text)) namePrototypes[text] = n;
+}
+
+NAME* ZOA_file::getName(NameKind k, const char* text) {
+    if (NAME* n = SUBPROG::getMatchingName(k, text, names)) return n;
+    NAME* n = new NAME(static_cast<unsigned int>(names.size()), k, text);
+    names.push_back(n);
+    if (k == SUBPROG_REF) addFunctionPrototype(n);
+    return n;
+}
+
+NAME* ZOA_file::getName(CONST* c) {
+    if (NAME* n = SUBPROG::getMatchingName(c, names)) return n;
+    NAME* n = new NAME(static_cast<unsigned int>(names.size()), c);
+    names.push_back(n);
+    return n;
+}
+
+NAME* ZOA_file::getName(const std::list<ExprBase*>& values) {
+    if (NAME* n = SUBPROG::getMatchingName(values, names)) return n;
+    NAME* n = new NAME(static_cast<unsigned int>(names.size()), values);
+    names.push_back(n);
+    return n;
+}
+
+NAME* ZOA_file::getName(LABEL* l) { return new NAME(l); }
+
+}  // namespace ZOA

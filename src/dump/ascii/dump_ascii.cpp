@@ -1,0 +1,8 @@
+// ZOA_file::dumpAscii (placeholder).
+#include <zoa/zoa_file.h>
+
+namespace ZOA {
+
+bool ZOA_file::dumpAscii(std::ostream&) { return true; }
+
+}  // namespace ZOA

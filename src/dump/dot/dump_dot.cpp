@@ -1,0 +1,8 @@
+// ZOA_file::dumpDot (placeholder).
+#include <zoa/zoa_file.h>
+
+namespace ZOA {
+
+bool ZOA_file::dumpDot(std::ostream&) { return true; }
+
+}  // namespace ZOA

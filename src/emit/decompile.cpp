@@ -1,0 +1,32 @@
+// ZOA_file::decompile: the fixed sequence that drives one emitter over a unit.
+#include "emit/c/decompile_c.h"
+#include "emit/x86/decompile_asm.h"
+
+#include <zoa/zoa_file.h>
+
+#include <memory>
+#include <ostream>
+
+namespace ZOA {
+
+bool ZOA_file::decompile(std::ostream& os) {
+    std::unique_ptr<DecompileBase> emitter;
+    if (asmMode) emitter.reset(new DecompileASM(os, isGcc));
+    else emitter.reset(new DecompileC(os, isGcc));
+
+    for (NAME* n : names) emitter->defineName(n);
+    os << std::endl;
+    for (auto& entry : callPrototypes) emitter->declareCallPrototype(entry.second);
+    for (auto& entry : subprogPrototypes) emitter->declareSubprogPrototype(entry.second);
+    for (auto& entry : namePrototypes) emitter->declareNamePrototype(entry.second);
+    os << std::endl << std::endl;
+    for (SUBPROG* sp : subprogs) emitter->emitSubprogram(sp);
+    emitter.reset();
+
+    names.clear();
+    subprogs.clear();
+    callPrototypes.clear();
+    return true;
+}
+
+}  // namespace ZOA

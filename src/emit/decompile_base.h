@@ -1,0 +1,68 @@
+// DecompileBase: what the C and assembly emitters share, including the trace ordering of labels.
+#ifndef ZOA_EMIT_DECOMPILE_BASE_H
+#define ZOA_EMIT_DECOMPILE_BASE_H
+
+#include <zoa/subprog.h>
+#include <zoa/tree_base.h>
+#include <zoa/visitor.h>
+
+#include <ostream>
+#include <vector>
+
+namespace ZOA {
+
+class DecompileBase : public VisitorBase {
+public:
+    // Marks a label that already has its place in the trace order.
+    class LABELAnnotation : public TreeAnnotation {
+    public:
+        bool placed = true;
+    };
+    // On a JUMP or CJUMP that placed its target: the label placed right before it.
+    class TraceAnnotation : public TreeAnnotation {
+    public:
+        explicit TraceAnnotation(LABEL* prev) : prevLabel(prev) {}
+        LABEL* prevLabel;
+    };
+
+    DecompileBase(std::ostream& os, bool isGcc);
+    ~DecompileBase() override;
+
+    void reservedHook1(void*) override {}
+    void reservedHook2(void*) override {}
+    void reservedHook3(void*) override {}
+
+    virtual void defineName(NAME* n) = 0;
+    virtual void declareNamePrototype(NAME* n) = 0;
+    virtual void declareSubprogPrototype(SUBPROG* sp) = 0;
+    virtual void declareCallPrototype(CALL* c) = 0;
+
+    // Writes n levels of four blanks and returns the stream.
+    std::ostream& indent(unsigned int n);
+    // Prints one subprogram through its visit, then resets the per-subprogram state.
+    bool emitSubprogram(SUBPROG* sp);
+    // Orders curSubprog's labels so that jumps can fall through (see the .cpp).
+    void buildTraces();
+    void traceStatement(StmtBase* s, LABEL*& last);
+    // True when stmt (a JUMP to a label, or a CJUMP's false branch) targets the
+    // label printed right after curLabel, so the jump is left out.
+    bool fallsThrough(StmtBase* stmt) const;
+
+    std::ostream& stream() { return out; }
+
+protected:
+    bool isGcc;
+    unsigned int indentLevel = 0;
+    std::vector<LABEL*> traceOrder;
+    SUBPROG* curSubprog = nullptr;
+    LABEL* curLabel = nullptr;
+    std::ostream& out;
+
+private:
+    bool place(LABEL* l);
+    std::vector<StmtBase*> pending;  // reused work stack of buildTraces
+};
+
+}  // namespace ZOA
+
+#endif
