@@ -214,7 +214,8 @@ TEST(AsciiDump, NullChildrenShowNullIdentities) {
     ZOA_file unit(true, false);
     SUBPROG* f = unit.createSubprog(VOID, "f", false);
     NAME* holey = f->getName(std::list<ExprBase*>{nullptr});
-    auto* call = new CALL(INT_S, "h", {new UNOP(INT_S, NEG, nullptr), nullptr, holey});
+    auto* call = new CALL(INT_S, "h",
+                          {new UNOP(INT_S, NEG, nullptr), nullptr, holey, new BINOP(INT_S, MUL, nullptr, nullptr)});
     auto* stmt = new SEQ(new MOVE(nullptr, nullptr),
                          new SEQ(new EXP(call), new SEQ(new JUMP(static_cast<LABEL*>(nullptr)),
                                                         new CJUMP(EQ, nullptr, new MEM(INT_S, nullptr),
