@@ -24,7 +24,14 @@ namespace ZOA {
 //    prototypes; a second decompile writes only the remaining prototypes.
 //  - dumpDot: one Graphviz digraph per subprogram; node statistics go to the
 //    process's standard output.
-//  - dumpAscii: an indented text dump of every subprogram.
+//  - dumpAscii: an indented text dump of every subprogram. Every line ends with
+//    std::endl; addresses identify the nodes; the stream's flags apply to the
+//    numbers. A label met again on its own jump path is written without its
+//    statement beneath (so jump cycles terminate); a null child shows a null
+//    identity and no block; a null POINTER constant shows "Value: (char *)0";
+//    a call with neither name nor pointer shows "Function Pointer: " and an
+//    empty line. An annotation shows as "class " and the qualified name of its
+//    dynamic C++ class (e.g. "class tools::Note"), from run-time type information.
 class ZOA_API ZOA_file {
 public:
     ZOA_file(bool isGcc, bool asmMode);

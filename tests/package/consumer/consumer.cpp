@@ -14,6 +14,9 @@ int main() {
         return 1;
     }
     std::ostringstream os;
-    unit.dumpAscii(os);
+    if (!unit.dumpAscii(os) || os.str().rfind("SUBPROG(", 0) != 0) {
+        std::cerr << "dumpAscii wrote no subprogram block\n";
+        return 1;
+    }
     return 0;
 }
