@@ -74,6 +74,8 @@ DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws)
     workspace.declaredOnce.clear();
     text.clear();
     if (!subprog) return;
+    // Temporaries and labels are most of what is collected once.
+    workspace.declaredOnce.reserve(subprog->getAllTemps().size() + subprog->getAllLabels().size());
     subprog->accept(this);
     writeStatistics(std::cout);
     writeGraphHeader();

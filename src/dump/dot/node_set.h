@@ -27,6 +27,11 @@ public:
         return true;
     }
 
+    // Makes room for n entries without further growth.
+    void reserve(std::size_t n) {
+        while (n * 2 > slots.size()) grow();
+    }
+
     void clear() {
         for (std::size_t i : used) slots[i] = nullptr;
         used.clear();
