@@ -34,5 +34,11 @@ int main(int argc, char** argv) {
         if (all) std::cout << "== ASCII dump\n";
         unit.dumpAscii(std::cout);
     }
+    if (all || std::strcmp(what, "dot") == 0) {
+        ZOA_file unit(true, false);
+        buildCount(unit);
+        if (all) std::cout << "== DOT graph (node statistics first)\n";
+        unit.dumpDot(std::cout);
+    }
     return 0;
 }

@@ -23,7 +23,9 @@ namespace ZOA {
 //    Afterwards the unit forgets its subprograms, file-level names and call
 //    prototypes; a second decompile writes only the remaining prototypes.
 //  - dumpDot: one Graphviz digraph per subprogram; node statistics go to the
-//    process's standard output.
+//    process's standard output. Operators beyond the classic ones are labelled
+//    with their enumerator names ("BITWISE_AND", "CONV4"), a POINTER constant
+//    holding a null pointer with "(char *)0"; null children get no edge.
 //  - dumpAscii: an indented text dump of every subprogram. Every line ends with
 //    std::endl; addresses identify the nodes; the stream's flags apply to the
 //    numbers. A label met again on its own jump path is written without its
