@@ -34,6 +34,12 @@ int main(int argc, char** argv) {
         if (all) std::cout << "== ASCII dump\n";
         unit.dumpAscii(std::cout);
     }
+    if (all || std::strcmp(what, "c") == 0) {
+        ZOA_file unit(true, false);
+        buildCount(unit);
+        if (all) std::cout << "== C (GCC flavour)\n";
+        unit.decompile(std::cout);
+    }
     if (all || std::strcmp(what, "dot") == 0) {
         ZOA_file unit(true, false);
         buildCount(unit);

@@ -22,6 +22,14 @@ namespace ZOA {
 //    assembly mode, 32-bit x86 assembly for the GNU assembler (Intel syntax).
 //    Afterwards the unit forgets its subprograms, file-level names and call
 //    prototypes; a second decompile writes only the remaining prototypes.
+//    The C uses the type names uint64 and int64 without defining them. Where
+//    the tree leaves the C open it stays compilable: a STATIC_DATA_REF made
+//    from a constant is referred to as ng<id>/nl<id>, as it is defined; a data
+//    name without values is defined as "static char ng<id>[1];" (arrays) or
+//    "static <type><text>;" (static data); a string literal inside an array
+//    initializer is written as the quoted literal; in the MSVC flavour a label
+//    address moved into a temporary is stored with "MOV t<id>, EAX". Missing
+//    (null) children print as nothing.
 //  - dumpDot: one Graphviz digraph per subprogram; node statistics go to the
 //    process's standard output. Operators beyond the classic ones are labelled
 //    with their enumerator names ("BITWISE_AND", "CONV4"), a POINTER constant

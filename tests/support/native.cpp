@@ -57,7 +57,12 @@ CommandResult buildAndRun32(const std::string& dir, const std::vector<std::strin
         ADD_FAILURE() << "32-bit build failed:\n" << cmd << "\n" << build.output;
         return build;
     }
-    return runCommand("'" + exe + "'");
+    CommandResult run = runCommand("'" + exe + "'");
+    // Kernels without 32-bit support refuse the program (126): run it under
+    // user-mode emulation when that is installed.
+    if (run.status == 126 && runCommand("command -v qemu-i386").status == 0)
+        run = runCommand("qemu-i386 '" + exe + "'");
+    return run;
 }
 
 bool matchesGolden(const std::string& relativePath, const std::string& text, std::string* diff) {

@@ -1,30 +1,234 @@
-// DecompileC (placeholder: writes nothing yet).
+// DecompileC: construction, the shared writers and the text of every expression.
 #include "emit/c/decompile_c.h"
 
+#include "emit/c/c_texts.h"
+
+#include <zoa/expr.h>
+
+#include <cfloat>
+#include <cmath>
+#include <cstdint>
+#include <cstdio>
+#include <cstring>
+
 namespace ZOA {
+
+namespace {
+
+bool sameText(const String& s, const char* text) {
+    std::size_t n = std::strlen(text);
+    return s.size() == n && std::memcmp(s.data(), text, n) == 0;
+}
+
+// The float the stream would see: values beyond the float range round to
+// FLT_MAX or to infinity as the hardware does, without undefined behaviour.
+float narrowToFloat(double v) {
+    double a = std::fabs(v);
+    if (!(a > FLT_MAX)) return static_cast<float>(v);
+    const double halfwayToInfinity = 0x1.ffffffp127;
+    float r = a < halfwayToInfinity ? FLT_MAX : HUGE_VALF;
+    return std::signbit(v) ? -r : r;
+}
+
+}  // namespace
 
 DecompileC::DecompileC(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc) {}
 DecompileC::~DecompileC() {}
 
-void DecompileC::visit(UNOP*) {}
-void DecompileC::visit(TEMP*) {}
-void DecompileC::visit(SUBPROG*) {}
-void DecompileC::visit(SEQ*) {}
-void DecompileC::visit(NAME*) {}
-void DecompileC::visit(MOVE*) {}
-void DecompileC::visit(MEM*) {}
-void DecompileC::visit(LABEL*) {}
-void DecompileC::visit(JUMP*) {}
-void DecompileC::visit(EXP*) {}
-void DecompileC::visit(CONST*) {}
-void DecompileC::visit(CJUMP*) {}
-void DecompileC::visit(CALL*) {}
-void DecompileC::visit(BUF_TEMP*) {}
-void DecompileC::visit(BINOP*) {}
+void DecompileC::writeInt(long long v) {
+    char buf[32];
+    int n = std::snprintf(buf, sizeof buf, "%lld", v);
+    out.write(buf, n);
+}
 
-void DecompileC::defineName(NAME*) {}
-void DecompileC::declareNamePrototype(NAME*) {}
-void DecompileC::declareSubprogPrototype(SUBPROG*) {}
-void DecompileC::declareCallPrototype(CALL*) {}
+void DecompileC::writeUnsigned(unsigned long long v) {
+    char buf[32];
+    int n = std::snprintf(buf, sizeof buf, "%llu", v);
+    out.write(buf, n);
+}
+
+void DecompileC::writeTypeName(DataType t) { out << ctext::typeName(t); }
+
+void DecompileC::writeBinopText(BinopKind op) { out << ' ' << ctext::binopText(op) << ' '; }
+
+void DecompileC::writeUnopText(UnopKind op) { out << ctext::unopText(op); }
+
+void DecompileC::printFlat(ExprBase* e) {
+    if (!e) return;
+    unsigned int saved = indentLevel;
+    indentLevel = 0;
+    e->accept(this);
+    indentLevel = saved;
+}
+
+void DecompileC::writeOperand(ExprBase* e) {
+    if (!e) return;
+    NodeType t = e->getNodeType();
+    bool bare = t == TEMP_NODE || t == BUF_TEMP_NODE || t == CONST_NODE;
+    if (!bare) out << '(';
+    printFlat(e);
+    if (!bare) out << ')';
+}
+
+void DecompileC::writeDataPrefix(NAME* n) {
+    out << (n->isDeclaredLocal() ? "nl" : "ng");
+    writeUnsigned(n->getId());
+}
+
+void DecompileC::visit(TEMP* t) {
+    indent(indentLevel) << 't';
+    writeUnsigned(t->getId());
+}
+
+void DecompileC::visit(BUF_TEMP* t) {
+    indent(indentLevel) << 't';
+    writeUnsigned(t->getId());
+}
+
+void DecompileC::visit(CONST* c) {
+    indent(indentLevel);
+    long long v = c->getIValue();
+    std::uint32_t low = static_cast<std::uint32_t>(v);
+    char buf[64];
+    int n = 0;
+    switch (c->getDataType()) {
+    case CHAR_U:
+        out << "(unsigned char)";
+        writeUnsigned(low);
+        return;
+    case INT_U:
+        writeUnsigned(low);
+        out << 'U';
+        return;
+    case INT64_U:
+        writeUnsigned(static_cast<unsigned long long>(v));
+        out << "LL";
+        return;
+    case CHAR_S:
+        out << "(char)";
+        writeInt(static_cast<std::int32_t>(low));
+        return;
+    case INT_S:
+        writeInt(static_cast<std::int32_t>(low));
+        return;
+    case INT64_S:
+        writeInt(v);
+        out << "LL";
+        return;
+    case FLOAT:
+        // What an ostream with default flags writes for the float.
+        n = std::snprintf(buf, sizeof buf, "%.*g", 6, static_cast<double>(narrowToFloat(c->getFValue())));
+        out.write(buf, n);
+        return;
+    case DOUBLE:
+        n = std::snprintf(buf, sizeof buf, "%#.17G", c->getFValue());
+        out.write(buf, n);
+        return;
+    case POINTER:
+        if (const char* text = static_cast<const char*>(c->getPValue())) out << text;
+        else out << "(char *)0";
+        return;
+    case VOID:
+        return;
+    }
+}
+
+void DecompileC::visit(NAME* n) {
+    switch (n->getKind()) {
+    case LABEL_REF:
+        out << "&&LAB";
+        writeUnsigned(n->getId());
+        return;
+    case SUBPROG_REF:
+        out << "(void *)" << n->getStringValue();
+        return;
+    case CONST_ARRAY_REF:
+    case DATA_ARRAY_REF:
+    case STRINGLIT_REF:
+        break;
+    case STATIC_DATA_REF:
+        // Made from a constant: no text, defined under its generated name.
+        if (n->getStringValue().empty()) break;
+        out << n->getStringValue();
+        return;
+    case EXTERN_DATA_REF:
+        out << n->getStringValue();
+        return;
+    }
+    writeDataPrefix(n);
+}
+
+void DecompileC::visit(MEM* m) {
+    indent(indentLevel) << "*((";
+    writeTypeName(m->getDataType());
+    out << "*)";
+    writeOperand(m->getExpr());
+    out << ')';
+}
+
+void DecompileC::visit(UNOP* u) {
+    ExprBase* x = u->getExpr();
+    out << '(';
+    if (u->getOp() == ABS) {
+        writeOperand(x);
+        out << ">=0?";
+        writeOperand(x);
+        out << ": -";
+        writeOperand(x);
+    } else {
+        writeUnopText(u->getOp());
+        out << '(';
+        writeOperand(x);
+        out << ')';
+    }
+    out << ')';
+}
+
+void DecompileC::visit(BINOP* b) {
+    out << '(';
+    writeOperand(b->getLeft());
+    writeBinopText(b->getOp());
+    writeOperand(b->getRight());
+    out << ')';
+}
+
+void DecompileC::writeArgTypes(CALL* c) {
+    bool first = true;
+    for (ExprBase* a : c->getArgs()) {
+        if (!first) out << ", ";
+        first = false;
+        if (a) writeTypeName(a->getDataType());
+    }
+}
+
+void DecompileC::writeArgList(CALL* c) {
+    out << '(';
+    bool first = true;
+    for (ExprBase* a : c->getArgs()) {
+        if (!first) out << ", ";
+        first = false;
+        printFlat(a);
+    }
+    out << ')';
+}
+
+void DecompileC::visit(CALL* c) {
+    indent(indentLevel);
+    if (TEMP* fp = c->getFunctionPointer()) {
+        out << "((";
+        writeTypeName(c->getDataType());
+        out << " (*)(";
+        writeArgTypes(c);
+        out << "))";
+        writeOperand(fp);
+        out << ')';
+    } else {
+        const String& name = c->getFunctionName();
+        // These two return untyped memory; the cast keeps the C well typed.
+        if (sameText(name, "alloca") || sameText(name, "malloc")) out << "(char *)";
+        out << name;
+    }
+    writeArgList(c);
+}
 
 }  // namespace ZOA
