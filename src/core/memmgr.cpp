@@ -35,10 +35,18 @@ void enterBlock(Arena& a) {
     a.end = a.next + MemMgr::BLOCK_SIZE;
 }
 
+// Obtains the first block and makes it current; dedicated blocks stay as they are.
+void prime(Arena& a) {
+    a.memBlkPtrs.push_back(obtainBlock(MemMgr::BLOCK_SIZE));
+    a.currentMemBlkPtr = a.memBlkPtrs.begin();
+    enterBlock(a);
+}
+
 // Moves to the next block (reusing one obtained earlier) and returns its start.
 char* advanceBlock(Arena& a) {
     if (a.memBlkPtrs.empty()) {
-        MemMgr::rewind();
+        // First use before any unit: a rewind here would free dedicated blocks still in use.
+        prime(a);
         return a.next;
     }
     ++a.currentMemBlkPtr;
@@ -61,9 +69,12 @@ void* allocateOversized(Arena& a, std::size_t size) {
 
 void MemMgr::rewind() {
     Arena& a = arena();
-    if (a.memBlkPtrs.empty()) a.memBlkPtrs.push_back(obtainBlock(BLOCK_SIZE));
     for (void* p : a.oversized) std::free(p);
     a.oversized.clear();
+    if (a.memBlkPtrs.empty()) {
+        prime(a);
+        return;
+    }
     a.currentMemBlkPtr = a.memBlkPtrs.begin();
     enterBlock(a);
 }
