@@ -57,15 +57,18 @@ public:
     // entered in the subprogram prototypes under its name.
     SUBPROG* createSubprog(DataType returnType, const char* name, bool addPrototype);
 
-    // Deduplicated file-level names, numbered from 0 in creation order. A new
-    // SUBPROG_REF name whose function has no subprogram here gets a prototype.
+    // Deduplicated file-level names, numbered by the count of recorded names (0
+    // first, again 0 after decompile). They match as SUBPROG's local names do
+    // (an empty value list included). A new SUBPROG_REF name whose function has
+    // no subprogram here gets a prototype; one found again does not.
     NAME* getName(NameKind k, const char* text);
     NAME* getName(CONST* c);
     NAME* getName(const std::list<ExprBase*>& values);
     NAME* getName(LABEL* l);  // a new LABEL_REF name on every call, not recorded
 
     // Records a prototype for the called function when no subprogram of the
-    // unit has its name (decided now); a later call of the same name replaces it.
+    // unit has its name (decided now); a later call of the same name replaces
+    // it. A call through a pointer goes under the empty name; null is ignored.
     void addFunctionPrototype(CALL* call);
 
     bool decompile(std::ostream& os);

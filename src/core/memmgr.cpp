@@ -35,10 +35,18 @@ void enterBlock(Arena& a) {
     a.end = a.next + MemMgr::BLOCK_SIZE;
 }
 
+// Obtains the first block and makes it current; dedicated blocks stay as they are.
+void prime(Arena& a) {
+    a.memBlkPtrs.push_back(obtainBlock(MemMgr::BLOCK_SIZE));
+    a.currentMemBlkPtr = a.memBlkPtrs.begin();
+    enterBlock(a);
+}
+
 // Moves to the next block (reusing one obtained earlier) and returns its start.
 char* advanceBlock(Arena& a) {
     if (a.memBlkPtrs.empty()) {
-        MemMgr::rewind();
+        // First use before any unit: a rewind here would free dedicated blocks still in use.
+        prime(a);
         return a.next;
     }
     ++a.currentMemBlkPtr;
@@ -50,20 +58,28 @@ char* advanceBlock(Arena& a) {
     return a.next;
 }
 
-void* allocateOversized(Arena& a, std::size_t size) {
+std::size_t padding(const char* at, std::size_t align) {
+    return (align - reinterpret_cast<std::uintptr_t>(at) % align) % align;
+}
+
+// A block of its own, released at the next rewind, holding size bytes at the alignment asked.
+void* allocateOversized(Arena& a, std::size_t size, std::size_t align = 1) {
     a.oversized.push_back(nullptr);  // reserve the list cell first: no leak if malloc throws
-    void* p = obtainBlock(size);
+    char* p = obtainBlock(size + align - 1);
     a.oversized.back() = p;
-    return p;
+    return p + padding(p, align);
 }
 
 }  // namespace
 
 void MemMgr::rewind() {
     Arena& a = arena();
-    if (a.memBlkPtrs.empty()) a.memBlkPtrs.push_back(obtainBlock(BLOCK_SIZE));
     for (void* p : a.oversized) std::free(p);
     a.oversized.clear();
+    if (a.memBlkPtrs.empty()) {
+        prime(a);
+        return;
+    }
     a.currentMemBlkPtr = a.memBlkPtrs.begin();
     enterBlock(a);
 }
@@ -83,18 +99,9 @@ void* MemMgr::allocate(unsigned int size) {
 
 void* MemMgr::allocateAligned(std::size_t size, std::size_t align) {
     Arena& a = arena();
-    if (size > BLOCK_SIZE) return allocateOversized(a, size);
-    if (a.next) {
-        std::uintptr_t at = reinterpret_cast<std::uintptr_t>(a.next);
-        std::size_t pad = (align - at % align) % align;
-        if (static_cast<std::size_t>(a.end - a.next) >= pad + size) {
-            char* p = a.next + pad;
-            a.next = p + size;
-            return p;
-        }
-    }
-    // Block starts come from malloc and are aligned for every fundamental type.
-    char* p = advanceBlock(a);
+    if (size + align > BLOCK_SIZE) return allocateOversized(a, size, align);
+    if (!a.next || static_cast<std::size_t>(a.end - a.next) < padding(a.next, align) + size) advanceBlock(a);
+    char* p = a.next + padding(a.next, align);
     a.next = p + size;
     return p;
 }
