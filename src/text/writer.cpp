@@ -393,6 +393,9 @@ void Writer::subprog(std::size_t i) {
     std::map<unsigned int, std::pair<LABEL*, bool>> all;
     for (auto& [id, l] : sp->getAllLabels()) all[id] = {l, true};
     for (auto& [id, l] : dead[i]) all[id] = {l, false};
+    // The start and return labels exist from construction; say so if they were freed.
+    for (unsigned int id = 0; id < 2; ++id)
+        if (!sp->getAllLabels().count(id) && !dead[i].count(id)) os << "    (dead L" << id << ")\n";
     for (auto& [id, e] : all) {
         if (id < 2 && e.second) continue;
         os << (e.second ? "    (label L" : "    (dead L") << id;
