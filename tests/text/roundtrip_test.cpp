@@ -20,9 +20,10 @@ using namespace ZOA;
 
 namespace {
 
-// Addresses differ from run to run: number them in order of appearance.
+// Addresses differ from run to run: number them in order of appearance. The
+// ASCII dump writes them in hex, the DOT dump as decimal node names.
 std::string normaliseAddresses(const std::string& s) {
-    static const std::regex addr("0x[0-9a-fA-F]+");
+    static const std::regex addr("0x[0-9a-fA-F]+|\\b[0-9]{6,}(?=;| ->| \\[)");
     std::map<std::string, int> seen;
     std::string out;
     auto begin = std::sregex_iterator(s.begin(), s.end(), addr);
