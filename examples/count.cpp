@@ -34,5 +34,11 @@ int main(int argc, char** argv) {
         if (all) std::cout << "== ASCII dump\n";
         unit.dumpAscii(std::cout);
     }
+    if (all || std::strcmp(what, "asm") == 0) {
+        ZOA_file unit(true, true);
+        buildCount(unit);
+        if (all) std::cout << "== assembly\n";
+        unit.decompile(std::cout);
+    }
     return 0;
 }
