@@ -251,7 +251,7 @@ void buildQuirks(ZOA_file& unit) {
     SUBPROG* nest = unit.createSubprog(INT_S, "nest", false);
     TEMP* y = nest->getArgTemp(INT_S);
     nest->getStartLabel()->addStmt(
-        new MOVE(nest->getReturnTemp(), new CALL(INT_S, "g2", {y, new CALL(INT_S, "g1", {new CONST(3)})})));
+        new MOVE(nest->getReturnTemp(), new CALL(INT_S, "g2", {new CALL(INT_S, "g1", {new CONST(3), new CONST(4)}), y})));
 }
 
 struct Unit {

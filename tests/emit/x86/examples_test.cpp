@@ -28,10 +28,10 @@ TEST(AsmExamples, DataTableAndNameKinds) {
               ".int 1\n.int 2\n.int 3\n\n");
 
     // One of each kind, as the unit writes them (see the golden file).
+    unit.getName(std::list<ExprBase*>{});
     unit.getName(std::list<ExprBase*>{new CONST(static_cast<unsigned char>(65)), new CONST(static_cast<unsigned char>(66))});
     unit.getName(STRINGLIT_REF, "say \"hi\"");
     unit.getName(new CONST(-5LL));
-    unit.getName(std::list<ExprBase*>{});
     unit.getName(DATA_ARRAY_REF, "external");
     unit.getName(STATIC_DATA_REF, "alsoExternal");
     unit.getName(SUBPROG_REF, "g");

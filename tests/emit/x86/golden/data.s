@@ -10,21 +10,27 @@ tab:
 .section .rodata
 .align 4
 .type ng1,@object
-.size ng1,2
+.size ng1,0
 ng1:
+
+.section .rodata
+.align 4
+.type ng2,@object
+.size ng2,2
+ng2:
 .byte 65
 .byte 66
 
 .section .rodata
 .align 4
-ng2:
+ng3:
 .string "say "hi""
 
 .section .rodata
 .align 8
-.type ng3,@object
-.size ng3,8
-ng3:
+.type ng4,@object
+.size ng4,8
+ng4:
 .quad -5
 
 

@@ -117,12 +117,14 @@ nest:
     sub esp, 16
     mov DWORD PTR -4[ebp], DWORD PTR ebx
 .La0:
+    mov DWORD PTR eax, DWORD PTR t1[ebp]
+    mov DWORD PTR [esp+4], eax
+    mov DWORD PTR eax, 4
+    mov DWORD PTR [esp+4], eax
     mov DWORD PTR eax, 3
     mov DWORD PTR [esp], eax
     call g1
     mov DWORD PTR eax, DWORD PTR eax
-    mov DWORD PTR [esp+4], eax
-    mov DWORD PTR eax, DWORD PTR t1[ebp]
     mov DWORD PTR [esp], eax
     call g2
     mov DWORD PTR t0[ebp], DWORD PTR eax
