@@ -22,6 +22,7 @@ namespace ZOA {
 //    assembly mode, 32-bit x86 assembly for the GNU assembler (Intel syntax).
 //    Afterwards the unit forgets its subprograms, file-level names and call
 //    prototypes; a second decompile writes only the remaining prototypes.
+//    In assembly a NAME is .La<id>, its text or ng<id>/nl<id>: an address, but static/extern data a dword value.
 //  - dumpDot: one Graphviz digraph per subprogram; node statistics go to the
 //    process's standard output.
 //  - dumpAscii: an indented text dump of every subprogram.
