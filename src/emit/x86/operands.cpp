@@ -196,12 +196,11 @@ void DecompileASM::visit(CONST* c) {
     case INT64_S: n = std::snprintf(buf, sizeof buf, "%lld", c->getIValue()); break;
     case FLOAT:
     case DOUBLE:
-        // A huge double needs more room than buf; fall back to a heap text then.
+        // A huge double needs more room than buf: print it into memText itself.
         n = std::snprintf(buf, sizeof buf, "%f", c->getFValue());
         if (n >= static_cast<int>(sizeof buf)) {
-            std::string big(static_cast<std::size_t>(n) + 1, '\0');
-            std::snprintf(&big[0], big.size(), "%f", c->getFValue());
-            a->memText.assign(big.c_str(), static_cast<std::size_t>(n));
+            a->memText.resize(static_cast<std::size_t>(n));
+            std::snprintf(&a->memText[0], static_cast<std::size_t>(n) + 1, "%f", c->getFValue());
             return;
         }
         break;

@@ -59,6 +59,7 @@ TEST(AsmExamples, OperandTexts) {
     EXPECT_EQ(text(new CONST(-5LL)), "-5");
     EXPECT_EQ(text(new CONST(18446744073709551615ULL)), "18446744073709551615");
     EXPECT_EQ(text(new CONST(1.5f)), "1.500000");
+    EXPECT_EQ(text(new CONST(1e300)).size(), 308u);
     EXPECT_EQ(text(new CONST(static_cast<void*>(nullptr))), "0");
     static char sym[] = "OFFSET FLAT:table";
     EXPECT_EQ(text(new CONST(static_cast<void*>(sym))), "OFFSET FLAT:table");
@@ -181,6 +182,13 @@ TEST(AsmExamples, Moves) {
     EXPECT_EQ(lines(new MOVE(nullptr, nullptr)), "    mov , \n");
     EXPECT_EQ(lines(new CJUMP(MAX_BINOP, nullptr, nullptr, nullptr, nullptr)), "    cmp , \n");
     EXPECT_EQ(lines(new SEQ(new EXP(nullptr), nullptr)), "");
+    EXPECT_EQ(lines(new EXP(new BINOP(INT_S, PLUS, nullptr, nullptr))), "    add , \n");
+    EXPECT_EQ(lines(new EXP(new UNOP(INT_S, CONV4, nullptr))), "    movzx eax, \n");
+    EXPECT_EQ(lines(new EXP(new UNOP(INT_S, NEG, t1))), "");
+    EXPECT_EQ(lines(new JUMP(static_cast<ExprBase*>(nullptr))), "    jmp \n");
+    EXPECT_EQ(lines(new EXP(new CALL(INT_S, "alloca", {nullptr}))), "    mov eax, esp\n");
+    EXPECT_EQ(lines(new EXP(new CALL(INT_S, "g", {nullptr, t1}))),
+              "    mov DWORD PTR eax, DWORD PTR t1[ebp]\n    mov DWORD PTR [esp+4], eax\n    call g\n");
 }
 
 // f(t1) with the unused t0, used locals t2 (INT_S) and t3 (CHAR_U), calling g(t2, 5).
