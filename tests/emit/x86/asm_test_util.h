@@ -1,5 +1,4 @@
-// Helpers shared by the assembly emitter tests: decompiling, a test view of the
-// emitter, and assembling the output for the 32-bit host.
+// Helpers for the assembly emitter tests: decompiling, a test view of the emitter, assembling.
 #ifndef ZOA_TESTS_EMIT_X86_ASM_TEST_UTIL_H
 #define ZOA_TESTS_EMIT_X86_ASM_TEST_UTIL_H
 
