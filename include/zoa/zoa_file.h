@@ -30,6 +30,10 @@ namespace ZOA {
 //    initializer is written as the quoted literal; in the MSVC flavour a label
 //    address moved into a temporary is stored with "MOV t<id>, EAX". Missing
 //    (null) children print as nothing.
+//    In assembly, a NAME is written as .La<id> (label address), its text
+//    (function, extern and text-made data names) or ng<id>/nl<id>; data and
+//    string names are addresses ("OFFSET FLAT:sym"), static and extern data
+//    are dword values ("DWORD PTR sym"). A null POINTER constant is 0.
 //  - dumpDot: one Graphviz digraph per subprogram; node statistics go to the
 //    process's standard output. Operators beyond the classic ones are labelled
 //    with their enumerator names ("BITWISE_AND", "CONV4"), a POINTER constant
