@@ -20,32 +20,15 @@ using namespace ZOA;
 
 namespace {
 
-// Addresses differ from run to run: number them in order of appearance. The
-// ASCII dump writes them in hex, the DOT dump as decimal node names.
-std::string normaliseAddresses(const std::string& s) {
-    static const std::regex addr("0x[0-9a-fA-F]+|\\b[0-9]{6,}(?=;| ->| \\[)");
-    std::map<std::string, int> seen;
-    std::string out;
-    auto begin = std::sregex_iterator(s.begin(), s.end(), addr);
-    std::size_t last = 0;
-    for (auto it = begin; it != std::sregex_iterator(); ++it) {
-        out.append(s, last, static_cast<std::size_t>(it->position()) - last);
-        auto found = seen.emplace(it->str(), static_cast<int>(seen.size())).first;
-        out += "@" + std::to_string(found->second);
-        last = static_cast<std::size_t>(it->position() + it->length());
-    }
-    return out + s.substr(last);
-}
-
 // Every output of a unit; decompile last, since it empties the unit.
 std::map<std::string, std::string> outputs(ZOA_file& u) {
     std::map<std::string, std::string> out;
     out["text"] = text::write(u);
     std::ostringstream ascii, dot, code;
     u.dumpAscii(ascii);
-    out["ascii"] = normaliseAddresses(ascii.str());
+    out["ascii"] = ZOA::testing::normaliseAddresses(ascii.str());
     u.dumpDot(dot);
-    out["dot"] = normaliseAddresses(dot.str());
+    out["dot"] = ZOA::testing::normaliseAddresses(dot.str());
     u.decompile(code);
     out["decompile"] = code.str();
     return out;
