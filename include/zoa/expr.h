@@ -109,6 +109,13 @@ class ZOA_API CONST : public ExprBase {
 public:
     CONST(DataType t, long long v);
     CONST(DataType t, double v);
+    // So that CONST(INT_S, 5) and CONST(INT_U, 5u) compile as written: the
+    // value is kept as an integer, or as a double when t is FLOAT or DOUBLE.
+    CONST(DataType t, int v);
+    CONST(DataType t, unsigned int v);
+    CONST(DataType t, long v);
+    CONST(DataType t, unsigned long v);
+    CONST(DataType t, unsigned long long v);
     CONST(int v);
     CONST(char v);
     CONST(long long v);

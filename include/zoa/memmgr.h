@@ -82,8 +82,42 @@ public:
     template <class U> bool operator!=(const MemMgr_allocator<U>&) const noexcept { return false; }
 };
 
-// Containers and strings that live in the arena.
-using String = std::basic_string<char, std::char_traits<char>, MemMgr_allocator<char>>;
+// A string that lives in the arena: names and texts held by nodes. It is a
+// std::basic_string over the arena allocator that also converts to std::string
+// and compares with one, so client code can treat it as a standard string.
+class String : public std::basic_string<char, std::char_traits<char>, MemMgr_allocator<char>> {
+public:
+    using Base = std::basic_string<char, std::char_traits<char>, MemMgr_allocator<char>>;
+    using Base::Base;
+    String() = default;
+    String(const Base& s) : Base(s) {}
+    String(const std::string& s) : Base(s.data(), s.size()) {}
+
+    operator std::string() const { return std::string(data(), size()); }
+
+    // Equality with arena strings, standard strings and C strings.
+    friend bool operator==(const String& a, const String& b) { return a.equals(b.data(), b.size()); }
+    friend bool operator==(const String& a, const std::string& b) { return a.equals(b.data(), b.size()); }
+    friend bool operator==(const std::string& a, const String& b) { return b.equals(a.data(), a.size()); }
+    friend bool operator==(const String& a, const char* b) { return a.compare(b) == 0; }
+    friend bool operator==(const char* a, const String& b) { return b.compare(a) == 0; }
+    friend bool operator!=(const String& a, const String& b) { return !(a == b); }
+    friend bool operator!=(const String& a, const std::string& b) { return !(a == b); }
+    friend bool operator!=(const std::string& a, const String& b) { return !(a == b); }
+    friend bool operator!=(const String& a, const char* b) { return !(a == b); }
+    friend bool operator!=(const char* a, const String& b) { return !(a == b); }
+    // Concatenation gives an ordinary std::string.
+    friend std::string operator+(const String& a, const char* b) { return std::string(a) + b; }
+    friend std::string operator+(const char* a, const String& b) { return a + std::string(b); }
+    friend std::string operator+(const String& a, const std::string& b) { return std::string(a) + b; }
+    friend std::string operator+(const std::string& a, const String& b) { return a + std::string(b); }
+    friend std::string operator+(const String& a, char b) { return std::string(a) + b; }
+
+private:
+    bool equals(const char* p, std::size_t n) const { return size() == n && compare(0, n, p, n) == 0; }
+};
+
+// Containers that live in the arena.
 template <class T> using ArenaList = std::list<T, MemMgr_allocator<T>>;
 template <class T> using ArenaVector = std::vector<T, MemMgr_allocator<T>>;
 template <class K, class V>

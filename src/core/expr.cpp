@@ -67,6 +67,19 @@ void BUF_TEMP::accept(VisitorBase* v) { v->visit(this); }
 
 CONST::CONST(DataType t, long long v) : ExprBase(t) { value.i = v; }
 CONST::CONST(DataType t, double v) : ExprBase(t) { value.f = v; }
+namespace {
+// A typed integer literal: FLOAT and DOUBLE keep it as a double.
+template <class Int> void setTyped(DataType t, Int v, long long& i, double& f) {
+    if (t == FLOAT || t == DOUBLE) f = static_cast<double>(v);
+    else i = static_cast<long long>(v);
+}
+}  // namespace
+
+CONST::CONST(DataType t, int v) : ExprBase(t) { setTyped(t, v, value.i, value.f); }
+CONST::CONST(DataType t, unsigned int v) : ExprBase(t) { setTyped(t, v, value.i, value.f); }
+CONST::CONST(DataType t, long v) : ExprBase(t) { setTyped(t, v, value.i, value.f); }
+CONST::CONST(DataType t, unsigned long v) : ExprBase(t) { setTyped(t, v, value.i, value.f); }
+CONST::CONST(DataType t, unsigned long long v) : ExprBase(t) { setTyped(t, v, value.i, value.f); }
 CONST::CONST(int v) : ExprBase(INT_S) { value.i = v; }
 CONST::CONST(char v) : ExprBase(CHAR_S) { value.i = static_cast<signed char>(v); }
 CONST::CONST(long long v) : ExprBase(INT64_S) { value.i = v; }

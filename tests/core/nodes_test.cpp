@@ -97,11 +97,15 @@ TEST(CONST, ConstructorsKeepTypeAndExtendedValue) {
         {CONST(static_cast<unsigned char>(200)), CHAR_U, 200}, {CONST(static_cast<char>(-56)), CHAR_S, -56},
         {CONST(-1), INT_S, -1}, {CONST(4294967295u), INT_U, 4294967295LL}, {CONST(-5LL), INT64_S, -5},
         {CONST(~0ULL), INT64_U, -1}, {CONST(INT_U, 7LL), INT_U, 7},
+        // Typed literals written with a plain int, unsigned or 64-bit unsigned.
+        {CONST(INT_S, -3), INT_S, -3}, {CONST(INT_U, 4000000000u), INT_U, 4000000000LL},
+        {CONST(INT64_U, ~0ULL), INT64_U, -1}, {CONST(CHAR_S, 'x'), CHAR_S, 'x'},
     };
     for (const Int& c : ints) EXPECT_TRUE(c.k.getDataType() == c.t && c.k.getIValue() == c.v) << toString(c.t);
     EXPECT_TRUE(CONST(1.5f).getDataType() == FLOAT && CONST(1.5f).getFValue() == 1.5);
     EXPECT_EQ(CONST(0.1f).getFValue(), static_cast<double>(0.1f));
     EXPECT_TRUE(CONST(2.5).getDataType() == DOUBLE && CONST(FLOAT, 0.25).getFValue() == 0.25);
+    EXPECT_EQ(CONST(DOUBLE, 3).getFValue(), 3.0);  // an int literal for a floating type stays a number
     int x = 0;
     CONST p(static_cast<void*>(&x));
     EXPECT_TRUE(p.getDataType() == POINTER && p.getPValue() == &x);

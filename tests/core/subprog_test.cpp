@@ -29,6 +29,10 @@ TEST(SUBPROG, ConstructionNumbersLabelsAndTheReturnTemp) {
     EXPECT_TRUE(sp->getReturnTemp() == sp->getAllTemps().front() && sp->getReturnTemp()->getDataType() == INT_S);
     EXPECT_EQ(sp->getTemp(INT_S, 0, IN_USE_TEMP)->getId(), 1u);
     EXPECT_EQ(sp->createNewLabel(REGULAR_LABEL)->getId(), 2u);
+    // Names read like standard strings.
+    std::string name = sp->getName();
+    EXPECT_TRUE(name == "f" && sp->getName() == "f" && sp->getName() == std::string("f") && sp->getName() != "g");
+    EXPECT_EQ(sp->getName() + "()", std::string("f()"));
 
     SUBPROG* proc = unit.createSubprog(VOID, "p", false);
     EXPECT_TRUE(proc->getReturnTemp() == nullptr && proc->getAllTemps().empty());
