@@ -13,10 +13,16 @@ namespace {
 struct Arena {
     std::list<char*> memBlkPtrs;                  // every block, in the order obtained
     std::list<char*>::iterator currentMemBlkPtr;  // the block being filled
-    char* next = nullptr;                         // first free byte of the current block
-    char* end = nullptr;                          // one past the current block
     std::list<void*> oversized;                   // dedicated blocks of large requests
 };
+
+// The current block's free bytes, at namespace scope (zero-initialised, no
+// guard) so that the fast path is a compare and an add.
+struct Bump {
+    char* next;  // first free byte of the current block
+    char* end;   // one past the current block
+};
+Bump bump = {nullptr, nullptr};
 
 // Never destroyed: blocks stay reachable (and are never freed) until the process ends.
 Arena& arena() {
@@ -31,15 +37,15 @@ char* obtainBlock(std::size_t size) {
 }
 
 void enterBlock(Arena& a) {
-    a.next = *a.currentMemBlkPtr;
-    a.end = a.next + MemMgr::BLOCK_SIZE;
+    bump.next = *a.currentMemBlkPtr;
+    bump.end = bump.next + MemMgr::BLOCK_SIZE;
 }
 
 // Moves to the next block (reusing one obtained earlier) and returns its start.
 char* advanceBlock(Arena& a) {
     if (a.memBlkPtrs.empty()) {
         MemMgr::rewind();
-        return a.next;
+        return bump.next;
     }
     ++a.currentMemBlkPtr;
     if (a.currentMemBlkPtr == a.memBlkPtrs.end()) {
@@ -47,7 +53,7 @@ char* advanceBlock(Arena& a) {
         a.currentMemBlkPtr = std::prev(a.memBlkPtrs.end());
     }
     enterBlock(a);
-    return a.next;
+    return bump.next;
 }
 
 void* allocateOversized(Arena& a, std::size_t size) {
@@ -68,35 +74,46 @@ void MemMgr::rewind() {
     enterBlock(a);
 }
 
-void* MemMgr::allocate(unsigned int size) {
-    Arena& a = arena();
-    if (size > BLOCK_SIZE) return allocateOversized(a, size);
-    if (a.next && static_cast<std::size_t>(a.end - a.next) >= size) {
-        char* p = a.next;
-        a.next += size;
-        return p;
-    }
-    char* p = advanceBlock(a);
-    a.next = p + size;
-    return p;
-}
+namespace {
 
-void* MemMgr::allocateAligned(std::size_t size, std::size_t align) {
+// Slow path: a fresh block, an oversized request, or the arena's first use.
+void* allocateSlow(std::size_t size, std::size_t align) {
     Arena& a = arena();
-    if (size > BLOCK_SIZE) return allocateOversized(a, size);
-    if (a.next) {
-        std::uintptr_t at = reinterpret_cast<std::uintptr_t>(a.next);
-        std::size_t pad = (align - at % align) % align;
-        if (static_cast<std::size_t>(a.end - a.next) >= pad + size) {
-            char* p = a.next + pad;
-            a.next = p + size;
+    if (size > MemMgr::BLOCK_SIZE) return allocateOversized(a, size);
+    if (bump.next) {
+        std::size_t pad = (0 - reinterpret_cast<std::uintptr_t>(bump.next)) & (align - 1);
+        if (static_cast<std::size_t>(bump.end - bump.next) >= pad + size) {
+            char* p = bump.next + pad;
+            bump.next = p + size;
             return p;
         }
     }
     // Block starts come from malloc and are aligned for every fundamental type.
     char* p = advanceBlock(a);
-    a.next = p + size;
+    bump.next = p + size;
     return p;
+}
+
+}  // namespace
+
+void* MemMgr::allocate(unsigned int size) {
+    char* p = bump.next;
+    if (p && size <= static_cast<std::size_t>(bump.end - p)) {
+        bump.next = p + size;
+        return p;
+    }
+    return allocateSlow(size, 1);
+}
+
+void* MemMgr::allocateAligned(std::size_t size, std::size_t align) {
+    char* p = bump.next;
+    std::size_t pad = (0 - reinterpret_cast<std::uintptr_t>(p)) & (align - 1);
+    if (p && size <= BLOCK_SIZE && pad + size <= static_cast<std::size_t>(bump.end - p)) {
+        p += pad;
+        bump.next = p + size;
+        return p;
+    }
+    return allocateSlow(size, align);
 }
 
 void MemMgr::deallocate(void*, unsigned int) {}
@@ -104,7 +121,7 @@ void MemMgr::deallocate(void*, unsigned int) {}
 unsigned int MemMgr::getMemoryUsage() {
     Arena& a = arena();
     if (a.memBlkPtrs.empty()) return 0u - 1u;
-    unsigned int used = static_cast<unsigned int>(a.next - *a.currentMemBlkPtr);
+    unsigned int used = static_cast<unsigned int>(bump.next - *a.currentMemBlkPtr);
     unsigned int index = static_cast<unsigned int>(std::distance(a.memBlkPtrs.begin(), a.currentMemBlkPtr));
     return used + index - 1u;
 }
