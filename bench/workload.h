@@ -18,6 +18,11 @@ struct Shape {
 // conditional jump on v < b to the next label or the return label.
 void buildWorkload(ZOA_file& unit, const Shape& shape);
 
+// Keeps freed heap memory mapped (no mmap for large blocks, no trimming), so that
+// repeated runs measure the code rather than the kernel's page faults on the
+// megabytes of fresh output buffer each run would otherwise touch.
+void keepHeapMapped();
+
 }  // namespace ZOA::bench
 
 #endif

@@ -104,4 +104,11 @@ BENCHMARK_TEMPLATE(BM_Output, DOT)->Apply(shapes);
 
 }  // namespace
 
-BENCHMARK_MAIN();
+int main(int argc, char** argv) {
+    ZOA::bench::keepHeapMapped();
+    benchmark::Initialize(&argc, argv);
+    if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 1;
+    benchmark::RunSpecifiedBenchmarks();
+    benchmark::Shutdown();
+    return 0;
+}

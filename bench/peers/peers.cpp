@@ -80,6 +80,7 @@ int main(int argc, char** argv) {
     Shape shape{argc > 3 ? std::atoi(argv[1]) : 100, argc > 3 ? std::atoi(argv[2]) : 100,
                 argc > 3 ? std::atoi(argv[3]) : 10};
     int reps = argc > 4 ? std::atoi(argv[4]) : 11;
+    keepHeapMapped();
     double n = static_cast<double>(shape.totalStatements());
     std::string dumpPath = "/tmp/zoa_peers_gccjit_" + std::to_string(getpid()) + ".c";
 
