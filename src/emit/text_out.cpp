@@ -5,7 +5,7 @@
 
 namespace ZOA {
 
-TextOut& TextOut::indent(unsigned int n) {
+TextOut& TextOut::writeBlanks(unsigned int n) {
     static const char blanks[] = "                                                                ";
     constexpr unsigned int perChunk = (sizeof(blanks) - 1) / 4;
     while (n > perChunk) {
@@ -16,7 +16,7 @@ TextOut& TextOut::indent(unsigned int n) {
     return *this;
 }
 
-TextOut& TextOut::writeUnsigned(unsigned long long v) {
+TextOut& TextOut::writeDecimal(unsigned long long v) {
     char digits[24];
     auto r = std::to_chars(digits, digits + sizeof digits, v);
     return write(digits, static_cast<std::size_t>(r.ptr - digits));

@@ -59,9 +59,19 @@ public:
         return *this;
     }
     // n levels of four blanks.
-    TextOut& indent(unsigned int n);
+    TextOut& indent(unsigned int n) { return n == 0 ? *this : writeBlanks(n); }
     // Plain decimal.
-    TextOut& writeUnsigned(unsigned long long v);
+    TextOut& writeUnsigned(unsigned long long v) {
+        if (v < 100 && depth != 0 && CAPACITY - used >= 2) {
+            // Temporary and label ids are mostly small.
+            char* p = buf.get() + used;
+            if (v >= 10) *p++ = static_cast<char>('0' + v / 10);
+            *p++ = static_cast<char>('0' + v % 10);
+            used = static_cast<std::size_t>(p - buf.get());
+            return *this;
+        }
+        return writeDecimal(v);
+    }
     TextOut& writeInt(long long v);
 
     void flush() {
@@ -71,6 +81,9 @@ public:
     }
 
 private:
+    TextOut& writeBlanks(unsigned int n);
+    TextOut& writeDecimal(unsigned long long v);
+
     static constexpr std::size_t CAPACITY = 1 << 15;
     std::ostream& os;
     std::size_t used = 0;
