@@ -57,7 +57,7 @@ bool formatsPlainDecimal(const std::ostream& os) {
     return std::use_facet<std::numpunct<char>>(os.getloc()).grouping().empty();
 }
 
-void putView(std::string& text, std::string_view v) { text.append(v.data(), v.size()); }
+void putView(TextBuffer& text, std::string_view v) { text.append(v.data(), v.size()); }
 
 }  // namespace
 
@@ -425,9 +425,8 @@ void DumpDot::putUnsigned(unsigned long long v) {
         out << v;
         return;
     }
-    char buf[24];
-    auto r = std::to_chars(buf, buf + sizeof buf, v);
-    text.append(buf, static_cast<std::size_t>(r.ptr - buf));
+    char* at = text.tail(24);
+    text.commit(static_cast<std::size_t>(std::to_chars(at, at + 24, v).ptr - at));
 }
 
 void DumpDot::putSigned(long long v) {
@@ -436,9 +435,8 @@ void DumpDot::putSigned(long long v) {
         out << v;
         return;
     }
-    char buf[24];
-    auto r = std::to_chars(buf, buf + sizeof buf, v);
-    text.append(buf, static_cast<std::size_t>(r.ptr - buf));
+    char* at = text.tail(24);
+    text.commit(static_cast<std::size_t>(std::to_chars(at, at + 24, v).ptr - at));
 }
 
 void DumpDot::putIdentity(const TreeBase* n) {
