@@ -3,6 +3,7 @@
 #define ZOA_DUMP_TEXT_BUFFER_H
 
 #include <cstddef>
+#include <cstdint>
 #include <cstring>
 #include <memory>
 
@@ -15,7 +16,14 @@ class TextBuffer {
 public:
     void append(const char* s, std::size_t n) {
         if (n > capacity - used) grow(n);
-        std::memcpy(storage.get() + used, s, n);
+        copy(storage.get() + used, s, n);
+        used += n;
+    }
+    // n copies of c.
+    void fill(char c, std::size_t n) {
+        if (n > capacity - used) grow(n);
+        char* p = storage.get() + used;
+        for (std::size_t i = 0; i < n; ++i) p[i] = c;
         used += n;
     }
     void push_back(char c) {
@@ -35,6 +43,28 @@ public:
     void clear() { used = 0; }
 
 private:
+    // Short pieces (names, operators, numbers) are copied inline with two
+    // overlapping loads and stores instead of a call to the library's memcpy.
+    static void copy(char* d, const char* s, std::size_t n) {
+        if (n >= 8 && n <= 16) {
+            std::uint64_t a, b;
+            std::memcpy(&a, s, 8);
+            std::memcpy(&b, s + n - 8, 8);
+            std::memcpy(d, &a, 8);
+            std::memcpy(d + n - 8, &b, 8);
+        } else if (n >= 4 && n < 8) {
+            std::uint32_t a, b;
+            std::memcpy(&a, s, 4);
+            std::memcpy(&b, s + n - 4, 4);
+            std::memcpy(d, &a, 4);
+            std::memcpy(d + n - 4, &b, 4);
+        } else if (n < 4) {
+            for (std::size_t i = 0; i < n; ++i) d[i] = s[i];
+        } else {
+            std::memcpy(d, s, n);
+        }
+    }
+
     void grow(std::size_t n) {
         std::size_t want = capacity * 2 > used + n ? capacity * 2 : used + n;
         if (want < 4096) want = 4096;
