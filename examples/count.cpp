@@ -26,25 +26,32 @@ static void buildCount(ZOA_file& unit) {
 }
 
 int main(int argc, char** argv) {
+    struct Form {
+        const char* name;
+        const char* heading;
+        bool asmMode;
+        bool (ZOA_file::*write)(std::ostream&);
+    };
+    static const Form forms[] = {
+        {"ascii", "== ASCII dump\n", false, &ZOA_file::dumpAscii},
+        {"c", "== C (GCC flavour)\n", false, &ZOA_file::decompile},
+        {"asm", "== assembly\n", true, &ZOA_file::decompile},
+        {"dot", "== DOT graph (node statistics first)\n", false, &ZOA_file::dumpDot},
+    };
     const char* what = argc > 1 ? argv[1] : "all";
     bool all = std::strcmp(what, "all") == 0;
-    if (all || std::strcmp(what, "ascii") == 0) {
-        ZOA_file unit(true, false);
+    bool known = all;
+    for (const Form& form : forms) {
+        if (!all && std::strcmp(what, form.name) != 0) continue;
+        known = true;
+        ZOA_file unit(true, form.asmMode);  // each form gets a fresh unit: decompile empties it
         buildCount(unit);
-        if (all) std::cout << "== ASCII dump\n";
-        unit.dumpAscii(std::cout);
+        if (all) std::cout << form.heading;
+        (unit.*form.write)(std::cout);
     }
-    if (all || std::strcmp(what, "c") == 0) {
-        ZOA_file unit(true, false);
-        buildCount(unit);
-        if (all) std::cout << "== C (GCC flavour)\n";
-        unit.decompile(std::cout);
-    }
-    if (all || std::strcmp(what, "dot") == 0) {
-        ZOA_file unit(true, false);
-        buildCount(unit);
-        if (all) std::cout << "== DOT graph (node statistics first)\n";
-        unit.dumpDot(std::cout);
+    if (!known) {
+        std::cerr << "usage: count_example [all|ascii|c|asm|dot]\n";
+        return 2;
     }
     return 0;
 }

@@ -18,7 +18,9 @@ using ExprList = ArenaList<ExprBase*>;
 using ExprVector = ArenaVector<ExprBase*>;
 
 // left op right. A lone 8-bit operand of a 32-bit integer operation is widened
-// at construction by wrapping it in UNOP(type, CONV4, operand).
+// at construction by wrapping it in UNOP(type, CONV4, operand); constants,
+// pointers and 64-bit operands are never widened. With a null operand both
+// operands are stored as given.
 class ZOA_API BINOP : public ExprBase {
 public:
     BINOP(DataType t, BinopKind op, ExprBase* left, ExprBase* right);
@@ -176,7 +178,7 @@ protected:
     NAME(unsigned int id, NameKind k, const char* text);
     explicit NAME(LABEL* l);
     NAME(unsigned int id, CONST* c);
-    // A CONST_ARRAY_REF; an empty list is accepted and makes an empty array name.
+    // A CONST_ARRAY_REF; an empty list is accepted and makes a name with no values.
     NAME(unsigned int id, const std::list<ExprBase*>& values);
 
 private:
@@ -212,7 +214,9 @@ public:
 private:
     friend class TreeRewriter;
     // Position by position: a non-null entry replaces the argument, a null one
-    // keeps it. Entries past the vector's end keep their arguments too.
+    // keeps it. The argument count never changes: with a shorter vector the
+    // arguments past its end are kept, with a longer one the extra entries
+    // are ignored.
     void replaceArgs(const std::vector<ExprBase*>& newArgs);
     void checkArgs() {}
 

@@ -24,8 +24,9 @@ namespace ZOA {
 //    Typed allocations (node and annotation operator new, MemMgr_allocator<T>)
 //    go through allocateAligned, which first aligns the bump pointer to what
 //    the type needs, so no object is ever misaligned on a 64-bit host.
-//  - A request larger than a block is served from a dedicated malloc block of
-//    its own; it does not disturb the bump pointer and is not counted by
+//  - A request that cannot fit in a block (more than 0x100000 bytes, counting
+//    the alignment of a typed request) is served from a dedicated malloc block
+//    of its own; it does not disturb the bump pointer and is not counted by
 //    getMemoryUsage(). Dedicated blocks are released at the next rewind.
 //  - Allocating before the first ZOA_file exists primes the arena first.
 //  - A failing malloc throws std::bad_alloc.

@@ -57,12 +57,16 @@ public:
     void freeAllTemps();
 
     LABEL* createNewLabel(LabelKind k);
-    // Removes the label from the label map (an unknown label is ignored); the
-    // return label pointer becomes null if it was the return label.
+    // Removes the label's id from the label map; the return label pointer
+    // becomes null if it was the return label, the start label pointer is
+    // kept. A null label, or one whose id is not in the map, is ignored.
     void freeDeadLabel(LABEL* l);
 
-    // Deduplicated local names (declaredLocal set); getName(LABEL*) makes a new
-    // LABEL_REF name on every call and records nothing.
+    // Deduplicated local names (declaredLocal set); a match consumes no id.
+    // The list overload matches element by element, so an empty list returns
+    // the first name made from text, or else a new CONST_ARRAY_REF with no
+    // values. getName(LABEL*) makes a new LABEL_REF name on every call and
+    // records nothing.
     NAME* getName(NameKind k, const char* text);
     NAME* getName(CONST* c);
     NAME* getName(const std::list<ExprBase*>& values);

@@ -7,6 +7,7 @@
 #include <zoa/memmgr.h>
 
 #include <cstddef>
+#include <new>
 #include <string>
 
 namespace ZOA {
@@ -16,12 +17,16 @@ class TreeRewriter;
 
 // Base of every per-node annotation. Annotations live in the arena: delete runs
 // the destructor and gives no memory back. Derive your own with a destructor.
+// They are aligned as ordinary operator new would align them (any member type,
+// long double included), and over-aligned ones as their alignment asks.
 class ZOA_API TreeAnnotation {
 public:
     virtual ~TreeAnnotation() = 0;
 
     static void* operator new(std::size_t size);
+    static void* operator new(std::size_t size, std::align_val_t align);
     static void operator delete(void*, std::size_t) noexcept {}
+    static void operator delete(void*, std::size_t, std::align_val_t) noexcept {}
 };
 
 // Base of every node. Nodes live in the arena (operator new bumps it, delete

@@ -30,6 +30,10 @@ namespace ZOA {
 //    initializer is written as the quoted literal; in the MSVC flavour a label
 //    address moved into a temporary is stored with "MOV t<id>, EAX". Missing
 //    (null) children print as nothing.
+//    In assembly, a NAME is written as .La<id> (label address), its text
+//    (function, extern and text-made data names) or ng<id>/nl<id>; data and
+//    string names are addresses ("OFFSET FLAT:sym"), static and extern data
+//    are dword values ("DWORD PTR sym"). A null POINTER constant is 0.
 //  - dumpDot: one Graphviz digraph per subprogram; node statistics go to the
 //    process's standard output. Operators beyond the classic ones are labelled
 //    with their enumerator names ("BITWISE_AND", "CONV4"), a POINTER constant
@@ -57,15 +61,18 @@ public:
     // entered in the subprogram prototypes under its name.
     SUBPROG* createSubprog(DataType returnType, const char* name, bool addPrototype);
 
-    // Deduplicated file-level names, numbered from 0 in creation order. A new
-    // SUBPROG_REF name whose function has no subprogram here gets a prototype.
+    // Deduplicated file-level names, numbered by the count of recorded names (0
+    // first, again 0 after decompile). They match as SUBPROG's local names do
+    // (an empty value list included). A new SUBPROG_REF name whose function has
+    // no subprogram here gets a prototype; one found again does not.
     NAME* getName(NameKind k, const char* text);
     NAME* getName(CONST* c);
     NAME* getName(const std::list<ExprBase*>& values);
     NAME* getName(LABEL* l);  // a new LABEL_REF name on every call, not recorded
 
     // Records a prototype for the called function when no subprogram of the
-    // unit has its name (decided now); a later call of the same name replaces it.
+    // unit has its name (decided now); a later call of the same name replaces
+    // it. A call through a pointer goes under the empty name; null is ignored.
     void addFunctionPrototype(CALL* call);
 
     bool decompile(std::ostream& os);

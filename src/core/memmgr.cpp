@@ -41,10 +41,18 @@ void enterBlock(Arena& a) {
     bump.end = bump.next + MemMgr::BLOCK_SIZE;
 }
 
+// Obtains the first block and makes it current; dedicated blocks stay as they are.
+void prime(Arena& a) {
+    a.memBlkPtrs.push_back(obtainBlock(MemMgr::BLOCK_SIZE));
+    a.currentMemBlkPtr = a.memBlkPtrs.begin();
+    enterBlock(a);
+}
+
 // Moves to the next block (reusing one obtained earlier) and returns its start.
 char* advanceBlock(Arena& a) {
     if (a.memBlkPtrs.empty()) {
-        MemMgr::rewind();
+        // First use before any unit: a rewind here would free dedicated blocks still in use.
+        prime(a);
         return bump.next;
     }
     ++a.currentMemBlkPtr;
@@ -56,20 +64,28 @@ char* advanceBlock(Arena& a) {
     return bump.next;
 }
 
-void* allocateOversized(Arena& a, std::size_t size) {
+std::size_t padding(const char* at, std::size_t align) {
+    return (0 - reinterpret_cast<std::uintptr_t>(at)) & (align - 1);
+}
+
+// A block of its own, released at the next rewind, holding size bytes at the alignment asked.
+void* allocateOversized(Arena& a, std::size_t size, std::size_t align = 1) {
     a.oversized.push_back(nullptr);  // reserve the list cell first: no leak if malloc throws
-    void* p = obtainBlock(size);
+    char* p = obtainBlock(size + align - 1);
     a.oversized.back() = p;
-    return p;
+    return p + padding(p, align);
 }
 
 }  // namespace
 
 void MemMgr::rewind() {
     Arena& a = arena();
-    if (a.memBlkPtrs.empty()) a.memBlkPtrs.push_back(obtainBlock(BLOCK_SIZE));
     for (void* p : a.oversized) std::free(p);
     a.oversized.clear();
+    if (a.memBlkPtrs.empty()) {
+        prime(a);
+        return;
+    }
     a.currentMemBlkPtr = a.memBlkPtrs.begin();
     enterBlock(a);
 }
@@ -77,19 +93,13 @@ void MemMgr::rewind() {
 namespace {
 
 // Slow path: a fresh block, an oversized request, or the arena's first use.
-void* allocateSlow(std::size_t size, std::size_t align) {
+// Typed requests leave room for their alignment when judged oversized.
+void* allocateSlow(std::size_t size, std::size_t align, bool typed) {
     Arena& a = arena();
-    if (size > MemMgr::BLOCK_SIZE) return allocateOversized(a, size);
-    if (bump.next) {
-        std::size_t pad = (0 - reinterpret_cast<std::uintptr_t>(bump.next)) & (align - 1);
-        if (static_cast<std::size_t>(bump.end - bump.next) >= pad + size) {
-            char* p = bump.next + pad;
-            bump.next = p + size;
-            return p;
-        }
-    }
-    // Block starts come from malloc and are aligned for every fundamental type.
-    char* p = advanceBlock(a);
+    if ((typed ? size + align : size) > MemMgr::BLOCK_SIZE) return allocateOversized(a, size, align);
+    if (!bump.next || static_cast<std::size_t>(bump.end - bump.next) < padding(bump.next, align) + size)
+        advanceBlock(a);
+    char* p = bump.next + padding(bump.next, align);
     bump.next = p + size;
     return p;
 }
@@ -102,18 +112,18 @@ void* MemMgr::allocate(unsigned int size) {
         bump.next = p + size;
         return p;
     }
-    return allocateSlow(size, 1);
+    return allocateSlow(size, 1, false);
 }
 
 void* MemMgr::allocateAligned(std::size_t size, std::size_t align) {
     char* p = bump.next;
-    std::size_t pad = (0 - reinterpret_cast<std::uintptr_t>(p)) & (align - 1);
-    if (p && size <= BLOCK_SIZE && pad + size <= static_cast<std::size_t>(bump.end - p)) {
+    std::size_t pad = padding(p, align);
+    if (p && size + align <= BLOCK_SIZE && pad + size <= static_cast<std::size_t>(bump.end - p)) {
         p += pad;
         bump.next = p + size;
         return p;
     }
-    return allocateSlow(size, align);
+    return allocateSlow(size, align, true);
 }
 
 void MemMgr::deallocate(void*, unsigned int) {}

@@ -11,7 +11,13 @@ constexpr std::size_t NODE_ALIGN = alignof(std::max_align_t) < 8 ? alignof(std::
 
 TreeAnnotation::~TreeAnnotation() {}
 
-void* TreeAnnotation::operator new(std::size_t size) { return MemMgr::allocateAligned(size, NODE_ALIGN); }
+// Annotations are client classes: give them what global operator new promises.
+void* TreeAnnotation::operator new(std::size_t size) { return MemMgr::allocateAligned(size, alignof(std::max_align_t)); }
+
+void* TreeAnnotation::operator new(std::size_t size, std::align_val_t align) {
+    std::size_t a = static_cast<std::size_t>(align);
+    return MemMgr::allocateAligned(size, a > alignof(std::max_align_t) ? a : alignof(std::max_align_t));
+}
 
 void* TreeBase::operator new(std::size_t size) { return MemMgr::allocateAligned(size, NODE_ALIGN); }
 

@@ -9,6 +9,8 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
+#include <map>
+#include <regex>
 #include <sstream>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -63,6 +65,20 @@ CommandResult buildAndRun32(const std::string& dir, const std::vector<std::strin
     if (run.status == 126 && runCommand("command -v qemu-i386").status == 0)
         run = runCommand("qemu-i386 '" + exe + "'");
     return run;
+}
+
+std::string normaliseAddresses(const std::string& s) {
+    static const std::regex addr("0x[0-9a-fA-F]+|\\b[0-9]{6,}(?=;| ->| \\[)");
+    std::map<std::string, int> seen;
+    std::string out;
+    std::size_t last = 0;
+    for (auto it = std::sregex_iterator(s.begin(), s.end(), addr); it != std::sregex_iterator(); ++it) {
+        out.append(s, last, static_cast<std::size_t>(it->position()) - last);
+        auto found = seen.emplace(it->str(), static_cast<int>(seen.size())).first;
+        out += "@" + std::to_string(found->second);
+        last = static_cast<std::size_t>(it->position() + it->length());
+    }
+    return out + s.substr(last);
 }
 
 bool matchesGolden(const std::string& relativePath, const std::string& text, std::string* diff) {

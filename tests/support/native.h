@@ -29,6 +29,10 @@ std::string writeFile(const std::string& dir, const std::string& name, const std
 CommandResult buildAndRun32(const std::string& dir, const std::vector<std::string>& sources,
                             const std::string& flags = "");
 
+// Node addresses differ from run to run: numbers them (@0, @1, ...) in order of
+// appearance, both the ASCII dump's hex form and the DOT dump's decimal node names.
+std::string normaliseAddresses(const std::string& text);
+
 // Compares text with tests/<relative path>. With ZOA_UPDATE_GOLDEN=1 in the
 // environment the file is rewritten instead and the comparison passes.
 // Returns a gtest assertion result for EXPECT_TRUE.

@@ -191,11 +191,11 @@ TEST(CUnit, EveryFormInBothFlavours) {
     {
         ZOA_file unit(true, false);
         buildForms(unit);
-        EXPECT_GOLDEN("emit/c/golden/forms_gcc.c", decompiled(unit));
+        EXPECT_GOLDEN("emit/c/golden/forms_gcc.c.golden", decompiled(unit));
     }
     ZOA_file unit(false, false);
     buildForms(unit);
-    EXPECT_GOLDEN("emit/c/golden/forms_msvc.c", decompiled(unit));
+    EXPECT_GOLDEN("emit/c/golden/forms_msvc.c.golden", decompiled(unit));
 }
 
 TEST(CWriters, FloatConstantsPrintAsTheStreamDoes) {

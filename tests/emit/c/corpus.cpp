@@ -17,12 +17,6 @@ MEM* mem(DataType t, ExprBase* addr) { return new MEM(t, addr); }
 CONST* num(int v) { return new CONST(v); }
 MOVE* move(ExprBase* d, ExprBase* s) { return new MOVE(d, s); }
 
-std::string text(ZOA_file& unit) {
-    std::ostringstream os;
-    unit.decompile(os);
-    return os.str();
-}
-
 // int count(int n): i = 0; while (i < n) i = i + 1; return i;
 void buildCountInto(ZOA_file& unit) {
     SUBPROG* sp = unit.createSubprog(INT_S, "count", false);
@@ -38,16 +32,13 @@ void buildCountInto(ZOA_file& unit) {
     sp->getReturnLabel()->addStmt(move(sp->getReturnTemp(), i));
 }
 
-std::string countLoop(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void countLoop(ZOA_file& unit) {
     buildCountInto(unit);
     unit.getSubprogs().front()->makeStatic();
-    return text(unit);
 }
 
 // int fact(int n): n <= 1 ? 1 : n * fact(n - 1), through a named call.
-std::string factorial(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void factorial(ZOA_file& unit) {
     SUBPROG* sp = unit.createSubprog(INT_S, "fact", false);
     TEMP* n = sp->getArgTemp(INT_S);
     TEMP* r = sp->getTemp(INT_S, 0, IN_USE_TEMP);
@@ -61,13 +52,11 @@ std::string factorial(bool isGcc) {
     rec->addStmt(move(r, self));
     rec->addStmt(move(sp->getReturnTemp(), bin(INT_S, MUL, n, r)));
     rec->addStmt(new JUMP(sp->getReturnLabel()));
-    return text(unit);
 }
 
 // Calls through function pointers: one taken from a named function, one
 // loaded from a table of function addresses.
-std::string functionPointers(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void functionPointers(ZOA_file& unit) {
     NAME* triple = unit.getName(SUBPROG_REF, "zoa_triple");
     NAME* negate = unit.getName(SUBPROG_REF, "zoa_negate");
 
@@ -88,13 +77,11 @@ std::string functionPointers(bool isGcc) {
     s->addStmt(move(base, table));
     s->addStmt(move(f, mem(POINTER, at(base, bin(INT_S, MUL, which, num(4))))));
     s->addStmt(move(pick->getReturnTemp(), new CALL(INT_S, f, {y})));
-    return text(unit);
 }
 
 // A string literal walked byte by byte, an int table summed in a loop and a
 // table of string literals.
-std::string tables(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void tables(ZOA_file& unit) {
     NAME* lit = unit.getName(STRINGLIT_REF, "he said \"hi\"");
     std::list<ExprBase*> primes{num(3), num(1), num(4), num(1), num(5), num(9), num(2), num(6)};
     NAME* digits = unit.getName(primes);
@@ -144,12 +131,10 @@ std::string tables(bool isGcc) {
         s->addStmt(move(p, mem(POINTER, at(p, bin(INT_S, MUL, w, num(4))))));
         s->addStmt(move(pickc->getReturnTemp(), mem(CHAR_S, at(p, j))));
     }
-    return text(unit);
 }
 
 // A 13-byte buffer temporary written and read through MEM.
-std::string buffer(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void buffer(ZOA_file& unit) {
     SUBPROG* sp = unit.createSubprog(INT_S, "bufsum", false);
     TEMP* a = sp->getArgTemp(INT_S);
     TEMP* b = sp->getArgTemp(INT_S);
@@ -163,12 +148,10 @@ std::string buffer(bool isGcc) {
     s->addStmt(move(sp->getReturnTemp(),
                     add(add(mem(INT_S, buf), bin(INT_S, MUL, mem(INT_S, at(buf, num(4))), mem(INT_S, at(buf, num(8))))),
                         mem(CHAR_U, at(buf, num(12))))));
-    return text(unit);
 }
 
 // 8-bit operands widened by BINOP, a narrowing conversion, ABS and NEG.
-std::string widening(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void widening(ZOA_file& unit) {
     SUBPROG* w = unit.createSubprog(INT_S, "widen", false);
     {
         TEMP* a = w->getArgTemp(CHAR_U);
@@ -193,12 +176,10 @@ std::string widening(bool isGcc) {
         d->getStartLabel()->addStmt(
             move(d->getReturnTemp(), bin(INT_S, PLUS, new UNOP(INT_S, ABS, t), new UNOP(INT_S, NEG, num(0)))));
     }
-    return text(unit);
 }
 
 // 64-bit arithmetic, signed and unsigned, and a widening cast.
-std::string wide64(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void wide64(ZOA_file& unit) {
     SUBPROG* m = unit.createSubprog(INT64_S, "mul64", false);
     {
         TEMP* a = m->getArgTemp(INT64_S);
@@ -218,12 +199,10 @@ std::string wide64(bool isGcc) {
         UNOP* wide = new UNOP(INT64_S, CONV24, x);
         w->getStartLabel()->addStmt(move(w->getReturnTemp(), bin(INT64_S, MUL, wide, wide)));
     }
-    return text(unit);
 }
 
 // Heap and stack memory from malloc and alloca, with their call prototypes.
-std::string heap(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void heap(ZOA_file& unit) {
     for (const char* fn : {"onheap", "onstack"}) {
         bool useHeap = fn[2] == 'h';
         SUBPROG* sp = unit.createSubprog(INT_S, fn, false);
@@ -242,12 +221,10 @@ std::string heap(bool isGcc) {
             s->addStmt(new EXP(release));
         }
     }
-    return text(unit);
 }
 
 // A static and an extern subprogram called before they are defined.
-std::string linkage(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void linkage(ZOA_file& unit) {
     SUBPROG* user = unit.createSubprog(INT_S, "user", false);
     SUBPROG* helper = unit.createSubprog(INT_S, "helper", true);
     helper->makeStatic();
@@ -265,13 +242,11 @@ std::string linkage(bool isGcc) {
     helper->getStartLabel()->addStmt(move(helper->getReturnTemp(), add(hx, num(1))));
     TEMP* tx = twice->getArgTemp(INT_S);
     twice->getStartLabel()->addStmt(move(twice->getReturnTemp(), bin(INT_S, MUL, tx, num(2))));
-    return text(unit);
 }
 
 // A switch through a local table of label addresses, and a jump through a
 // label address kept in a temporary.
-std::string computedJump(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void computedJump(ZOA_file& unit) {
     SUBPROG* sp = unit.createSubprog(INT_S, "sw", false);
     TEMP* i = sp->getArgTemp(INT_S);
     TEMP* base = sp->getTemp(POINTER, 0, IN_USE_TEMP);
@@ -295,13 +270,11 @@ std::string computedJump(bool isGcc) {
     big->addStmt(new JUMP(where));
     other->addStmt(move(sp->getReturnTemp(), num(99)));
     other->addStmt(new JUMP(sp->getReturnLabel()));
-    return text(unit);
 }
 
 // File-level and local static data, external data, names without values,
 // and floating-point constants.
-std::string data(bool isGcc) {
-    ZOA_file unit(isGcc, false);
+void data(ZOA_file& unit) {
     NAME* base = unit.getName(new CONST(41));
     NAME* scratch = unit.getName(DATA_ARRAY_REF, "scratch");
     NAME* slot = unit.getName(STATIC_DATA_REF, "zoa_slot");
@@ -335,10 +308,17 @@ std::string data(bool isGcc) {
         TEMP* x = half->getArgTemp(FLOAT);
         half->getStartLabel()->addStmt(move(half->getReturnTemp(), bin(FLOAT, MUL, x, new CONST(0.5f))));
     }
-    return text(unit);
 }
 
 }  // namespace
+
+std::string decompiled(const Program& p, bool isGcc) {
+    ZOA_file unit(isGcc, false);
+    p.build(unit);
+    std::ostringstream os;
+    unit.decompile(os);
+    return os.str();
+}
 
 const std::vector<Program>& programs() {
     static const std::vector<Program> all = {

@@ -3,6 +3,8 @@
 #ifndef ZOA_TESTS_EMIT_C_CORPUS_H
 #define ZOA_TESTS_EMIT_C_CORPUS_H
 
+#include <zoa/zoa_file.h>
+
 #include <string>
 #include <vector>
 
@@ -10,8 +12,8 @@ namespace ZOA::corpus {
 
 struct Program {
     const char* name;
-    // Builds the unit in a fresh ZOA_file and returns its decompiled C.
-    std::string (*build)(bool isGcc);
+    // Builds the program into a fresh unit.
+    void (*build)(ZOA_file& unit);
     // C appended to the GCC text: defines void check_<name>(report) calling
     // report(label, value) for each result.
     const char* check;
@@ -20,6 +22,9 @@ struct Program {
 };
 
 const std::vector<Program>& programs();
+
+// The program built into a fresh unit of the given flavour, decompiled.
+std::string decompiled(const Program& p, bool isGcc);
 
 // C defined outside the units (functions and data the units refer to by name).
 extern const char* const externals;

@@ -1,0 +1,85 @@
+// A readable S-expression text form of a unit: reading it builds a ZOA_file through
+// the public API, writing prints any unit so that reading it back rebuilds it.
+#ifndef ZOA_TEXT_H
+#define ZOA_TEXT_H
+
+#include <zoa/zoa_file.h>
+
+#include <iosfwd>
+#include <list>
+#include <memory>
+#include <string>
+#include <string_view>
+#include <unordered_map>
+#include <vector>
+
+namespace ZOA::text {
+
+// One problem found in the input, at a 1-based line and column.
+struct Diagnostic {
+    std::string file;
+    unsigned int line = 0;
+    unsigned int column = 0;
+    std::string message;
+};
+
+// "FILE:LINE:COL: error: message".
+std::string format(const Diagnostic& d);
+
+// Where a node was written: 1-based line and column.
+struct Position {
+    unsigned int line = 0;
+    unsigned int column = 0;
+};
+
+// What parse gives back: the unit it built, or the diagnostics that stopped it.
+// The unit was constructed (so the arena was rewound) whenever the text got as
+// far as its (unit ...) form; on failure it is dropped again. Texts of POINTER
+// constants are copied into the arena, so they live exactly as long as the nodes.
+class Result {
+public:
+    bool ok() const { return unit_ != nullptr && diagnostics_.empty(); }
+    ZOA_file* unit() const { return ok() ? unit_.get() : nullptr; }
+    // Hands the unit over to the caller (null on failure).
+    std::unique_ptr<ZOA_file> release() { return ok() ? std::move(unit_) : nullptr; }
+    const std::vector<Diagnostic>& diagnostics() const { return diagnostics_; }
+    // Where a node of the unit was written (for a temp, label or name: its
+    // declaration); null for nodes the text did not make.
+    const Position* positionOf(const TreeBase* node) const {
+        auto it = positions_.find(node);
+        return it == positions_.end() ? nullptr : &it->second;
+    }
+
+    // Filled by the reader.
+    std::unique_ptr<ZOA_file> unit_;
+    std::vector<Diagnostic> diagnostics_;
+    std::unordered_map<const TreeBase*, Position> positions_;
+};
+
+// Overrides the flavour the text names, e.g. to write a unit written for C as
+// assembly: the flags of a unit are fixed when it is constructed.
+struct Flavour {
+    bool isGcc = true;
+    bool asmMode = false;
+};
+
+// Nesting deeper than this many parentheses is refused with a diagnostic, so
+// that no input can exhaust the stack.
+constexpr unsigned int MAX_NESTING = 4096;
+
+// Reads a whole text. Never throws; stops at the first error and reports it
+// (one diagnostic). Constructing the unit rewinds the arena: every node of an
+// earlier unit is given up, so write or output an earlier unit before parsing.
+Result parse(std::string_view source, const std::string& fileName);
+Result parse(std::string_view source, const std::string& fileName, const Flavour& flavour);
+
+// Writes the unit in the text form. Shared subtrees are written once per use
+// (reading them back gives separate but equal nodes); shared leaves (temps,
+// names, labels) are written as references and stay shared. Writing a unit,
+// reading it back and writing that gives the same bytes.
+void write(std::ostream& os, const ZOA_file& unit);
+std::string write(const ZOA_file& unit);
+
+}  // namespace ZOA::text
+
+#endif

@@ -1,0 +1,310 @@
+// The assembly emitter's operands: type tables, operand texts, leaf visits and file-level data.
+#include "emit/x86/decompile_asm.h"
+
+#include <zoa/stmt.h>
+
+#include <cstdio>
+#include <cstring>
+#include <ostream>
+#include <typeinfo>
+
+namespace ZOA {
+
+namespace {
+
+struct TypeInfo {
+    unsigned int size;       // bytes of a value
+    const char* prefix;      // size keyword of a memory operand
+    const char* directive;   // data directive of one element
+    bool isSigned;
+};
+
+const TypeInfo typeInfos[DATA_TYPE_COUNT + 1] = {
+    {1, "BYTE PTR ", ".byte ", false},    // CHAR_U
+    {4, "DWORD PTR ", ".int ", false},    // INT_U
+    {8, "DWORD PTR ", ".quad ", false},   // INT64_U
+    {1, "BYTE PTR ", ".byte ", true},     // CHAR_S
+    {4, "DWORD PTR ", ".int ", true},     // INT_S
+    {8, "DWORD PTR ", ".quad ", true},    // INT64_S
+    {4, "", ".float ", true},             // FLOAT
+    {8, "", ".double ", true},            // DOUBLE
+    {4, "DWORD PTR ", ".long ", false},   // POINTER
+    {0, "", "", false},                   // VOID
+    {0, "", "", false},                   // anything outside the enumeration
+};
+
+const TypeInfo& infoOf(DataType t) {
+    unsigned int i = static_cast<unsigned int>(t);
+    return typeInfos[i < DATA_TYPE_COUNT ? i : DATA_TYPE_COUNT];
+}
+
+struct NameForm {
+    const char* prefix;  // address or value operand
+    bool fromText;       // symbol is the name's text when it has one
+};
+
+// By NameKind.
+const NameForm nameForms[] = {
+    {"OFFSET FLAT:", false},  // LABEL_REF: ".La" and the label id
+    {"OFFSET FLAT:", true},   // SUBPROG_REF
+    {"OFFSET FLAT:", false},  // CONST_ARRAY_REF
+    {"OFFSET FLAT:", true},   // DATA_ARRAY_REF
+    {"OFFSET FLAT:", false},  // STRINGLIT_REF: the text is the literal, not a symbol
+    {"DWORD PTR ", true},     // STATIC_DATA_REF
+    {"DWORD PTR ", true},     // EXTERN_DATA_REF
+};
+constexpr unsigned int NAME_KIND_COUNT = sizeof(nameForms) / sizeof(nameForms[0]);
+
+void appendNumber(String& s, const char* format, unsigned int v) {
+    char buf[16];
+    int n = std::snprintf(buf, sizeof buf, format, v);
+    if (n > 0) s.append(buf, static_cast<std::size_t>(n));
+}
+
+// memText of a NAME (see the class comment).
+void setNameText(NAME* n, String& text) {
+    unsigned int kind = static_cast<unsigned int>(n->getKind());
+    if (kind >= NAME_KIND_COUNT) return;
+    const NameForm& form = nameForms[kind];
+    text = form.prefix;
+    if (n->getKind() == LABEL_REF) {
+        text += ".La";
+        appendNumber(text, "%u", n->getId());
+    } else if (form.fromText && !n->getStringValue().empty()) {
+        text += n->getStringValue();
+    } else {
+        text += n->isDeclaredLocal() ? "nl" : "ng";
+        appendNumber(text, "%u", n->getId());
+    }
+}
+
+}  // namespace
+
+unsigned int DecompileASM::valueSize(ExprBase* e) {
+    if (!e) return 0;
+    if (e->getNodeType() == BUF_TEMP_NODE) return static_cast<BUF_TEMP*>(e)->getArraySize();
+    return infoOf(e->getDataType()).size;
+}
+
+const char* DecompileASM::sizePrefix(ExprBase* e) { return e ? infoOf(e->getDataType()).prefix : ""; }
+
+const char* DecompileASM::dataDirective(DataType t) { return infoOf(t).directive; }
+
+bool DecompileASM::isSignedType(ExprBase* e) { return e && infoOf(e->getDataType()).isSigned; }
+
+DecompileASM::ExprAnnotation* DecompileASM::annotationOf(const ExprBase* e) {
+    TreeAnnotation* a = e ? e->getAnnotation() : nullptr;
+    return a && typeid(*a) == typeid(ExprAnnotation) ? static_cast<ExprAnnotation*>(a) : nullptr;
+}
+
+DecompileASM::ExprAnnotation* DecompileASM::ensureAnnotation(ExprBase* e) {
+    ExprAnnotation* a = annotationOf(e);
+    if (a) return a;
+    a = new ExprAnnotation(0);
+    if (e->getNodeType() == NAME_NODE) setNameText(static_cast<NAME*>(e), a->memText);
+    e->setAnnotation(a, true);
+    return a;
+}
+
+DecompileASM::OperandParts DecompileASM::operandParts(ExprBase* e, bool useRegister, bool byteForm) {
+    OperandParts p{"", "", 0};
+    if (!e) return p;
+    NodeType kind = e->getNodeType();
+    ExprAnnotation* a = kind == NAME_NODE ? ensureAnnotation(e) : annotationOf(e);
+    if (kind != CONST_NODE) p.prefix = byteForm ? "BYTE PTR " : sizePrefix(e);
+    if (!a) return p;
+    if (a->reg == NO_REGISTER || !useRegister) {
+        if (kind == NAME_NODE) p.prefix = "";
+        p.text = a->memText.data();
+        p.length = a->memText.size();
+    } else {
+        AsmRegister r = byteForm ? registerOfClass(a->reg, LOW_BYTE) : a->reg;
+        p.text = registerName(r, a->isIndirect);
+        p.length = std::strlen(p.text);
+    }
+    return p;
+}
+
+std::string DecompileASM::operandText(ExprBase* e, bool useRegister) {
+    OperandParts p = operandParts(e, useRegister, false);
+    std::string s(p.prefix);
+    s.append(p.text, p.length);
+    return s;
+}
+
+std::string DecompileASM::byteOperandText(ExprBase* e) {
+    OperandParts p = operandParts(e, true, true);
+    std::string s(p.prefix);
+    s.append(p.text, p.length);
+    return s;
+}
+
+void DecompileASM::put(const char* s) { out.write(s, static_cast<std::streamsize>(std::strlen(s))); }
+
+void DecompileASM::putOperand(ExprBase* e, bool useRegister) {
+    OperandParts p = operandParts(e, useRegister, false);
+    put(p.prefix);
+    out.write(p.text, static_cast<std::streamsize>(p.length));
+}
+
+void DecompileASM::putByteOperand(ExprBase* e) {
+    OperandParts p = operandParts(e, true, true);
+    put(p.prefix);
+    out.write(p.text, static_cast<std::streamsize>(p.length));
+}
+
+void DecompileASM::putLabel(LABEL* l) {
+    put(".La");
+    if (l) out << l->getId();
+}
+
+// "t<id> = <offset>": makes t<id>[ebp] address the temporary's slot.
+void DecompileASM::writeTempSymbol(TEMP* t) {
+    if (!t) return;
+    ExprAnnotation* a = annotationOf(t);
+    line() << 't' << t->getId() << " = " << (a ? a->frameOffset : 0);
+    endLine();
+}
+
+void DecompileASM::writeNodeComment(TreeBase* node) {
+    const char* comment = node ? node->getComment() : nullptr;
+    if (!comment || !*comment) return;
+    line() << "# CONST: " << comment;
+    endLine();
+}
+
+void DecompileASM::visit(NAME* n) {
+    if (n) ensureAnnotation(n);
+}
+
+void DecompileASM::visit(CONST* c) {
+    writeNodeComment(c);
+    ExprAnnotation* a = ensureAnnotation(c);
+    if (!a->memText.empty() || a->reg != NO_REGISTER) return;
+    char buf[64];
+    int n = 0;
+    switch (c->getDataType()) {
+    case CHAR_U:
+    case INT_U:
+    case CHAR_S:
+    case INT_S:
+        n = std::snprintf(buf, sizeof buf, "%d", static_cast<int>(static_cast<unsigned int>(c->getIValue())));
+        break;
+    case INT64_U:
+        n = std::snprintf(buf, sizeof buf, "%llu", static_cast<unsigned long long>(c->getIValue()));
+        break;
+    case INT64_S: n = std::snprintf(buf, sizeof buf, "%lld", c->getIValue()); break;
+    case FLOAT:
+    case DOUBLE:
+        // A huge double needs more room than buf: print it into memText itself.
+        n = std::snprintf(buf, sizeof buf, "%f", c->getFValue());
+        if (n >= static_cast<int>(sizeof buf)) {
+            a->memText.resize(static_cast<std::size_t>(n));
+            std::snprintf(&a->memText[0], static_cast<std::size_t>(n) + 1, "%f", c->getFValue());
+            return;
+        }
+        break;
+    case POINTER:
+        if (c->getPValue()) {
+            a->memText = static_cast<const char*>(c->getPValue());
+            return;
+        }
+        buf[0] = '0';
+        n = 1;
+        break;
+    case VOID:
+        buf[0] = '0';
+        n = 1;
+        break;
+    }
+    if (n > 0) a->memText.assign(buf, static_cast<std::size_t>(n));
+}
+
+void DecompileASM::visit(TEMP* t) {
+    ExprAnnotation* a = ensureAnnotation(t);
+    if (a->reg != NO_REGISTER || !a->memText.empty()) return;
+    a->memText = "t";
+    appendNumber(a->memText, "%u", t->getId());
+    a->memText += "[ebp]";
+}
+
+// Writes the data of one file-level name; see the class comment for the
+// symbols and for names without values.
+void DecompileASM::defineName(NAME* n) {
+    if (!n) return;
+    ExprAnnotation* a = ensureAnnotation(n);
+    const String& text = a->memText;
+    std::size_t skip = text.find("OFFSET FLAT:") != String::npos ? 12 : text.find("DWORD PTR ") != String::npos ? 10 : 0;
+    if (skip > text.size()) skip = text.size();
+    const char* sym = text.c_str() + skip;
+    const ExprList& values = n->getList();
+    ExprBase* first = values.empty() ? nullptr : values.front();
+
+    switch (n->getKind()) {
+    case CONST_ARRAY_REF:
+    case DATA_ARRAY_REF: {
+        if (n->getKind() == DATA_ARRAY_REF && values.empty()) return;
+        DataType t = first ? first->getDataType() : VOID;
+        line() << (n->getKind() == CONST_ARRAY_REF ? ".section .rodata" : ".section .data");
+        endLine();
+        line() << ".align 4";
+        endLine();
+        line() << ".type " << sym << ",@object";
+        endLine();
+        line() << ".size " << sym << ',' << values.size() * ExprBase::sizeOfDataType(t);
+        endLine();
+        out << sym << ':';
+        endLine();
+        for (ExprBase* e : values) {
+            line() << dataDirective(t);
+            if (e && e->getNodeType() == NAME_NODE) {
+                out << static_cast<NAME*>(e)->getStringValue();
+                endLine();
+                endLine();
+                continue;
+            }
+            visitExpr(e);
+            putOperand(e, true);
+            endLine();
+        }
+        endLine();
+        return;
+    }
+    case STRINGLIT_REF:
+        line() << ".section .rodata";
+        endLine();
+        line() << ".align 4";
+        endLine();
+        out << sym << ':';
+        endLine();
+        line() << ".string \"" << n->getStringValue() << '"';
+        endLine();
+        endLine();
+        return;
+    case STATIC_DATA_REF: {
+        if (values.empty()) return;
+        unsigned int size = ExprBase::sizeOfDataType(n->getDataType());
+        line() << ".section .rodata";
+        endLine();
+        line() << ".align " << size;
+        endLine();
+        line() << ".type " << sym << ",@object";
+        endLine();
+        line() << ".size " << sym << ',' << size;
+        endLine();
+        out << sym << ':';
+        endLine();
+        line() << dataDirective(n->getDataType());
+        visitExpr(first);
+        putOperand(first, true);
+        endLine();
+        endLine();
+        return;
+    }
+    case LABEL_REF:
+    case SUBPROG_REF:
+    case EXTERN_DATA_REF: return;
+    }
+}
+
+}  // namespace ZOA

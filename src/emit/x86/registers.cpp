@@ -1,0 +1,276 @@
+// The assembly emitter's register model: names, aliasing, reservation, allocation and loads.
+#include "emit/x86/decompile_asm.h"
+
+namespace ZOA {
+
+namespace {
+
+struct RegisterText {
+    const char* plain;
+    const char* bracketed;
+};
+
+// Indexed by register number; null where a number has no text.
+const RegisterText registerTexts[NO_REGISTER] = {
+    {"ah", "[ah]"}, {"al", "[al]"}, {"bh", "[bh]"}, {"bl", "[bl]"},
+    {"ch", "[ch]"}, {"cl", "[cl]"}, {"dh", "[dh]"}, {"dl", "[dl]"},
+    {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {}, {},
+    {"eax", "[eax]"}, {"ebx", "[ebx]"}, {"ecx", "[ecx]"}, {"edx", "[edx]"},
+    {"edi", "[edi]"}, {"esi", "[esi]"}, {"ebp", "[ebp]"}, {"esp", "[esp]"},
+    {}, {}, {}, {}, {}, {}, {}, {},
+    {"rax", "[rax]"}, {"rbx", "[rbx]"}, {"rcx", "[rcx]"}, {"rdx", "[rdx]"},
+    {"rdi", "[rdi]"}, {"rsi", "[rsi]"}, {"rbp", "[rbp]"}, {"rsp", "[rsp]"},
+    {}, {}, {}, {}, {}, {}, {}, {},
+};
+
+AsmRegister reg(unsigned int n) { return static_cast<AsmRegister>(n); }
+
+// Register families: a, b, c, d have byte forms; di, si, bp, sp do not.
+bool hasByteForms(unsigned int family) { return family < 4; }
+
+}  // namespace
+
+const char* DecompileASM::registerName(AsmRegister r, bool bracketed) {
+    if (r == NO_REGISTER) return "";
+    if (r > NO_REGISTER || !registerTexts[r].plain) return "unknown register";
+    return bracketed ? registerTexts[r].bracketed : registerTexts[r].plain;
+}
+
+AsmRegister DecompileASM::registerOfClass(AsmRegister r, RegClass cls) {
+    if (r < 8) {
+        switch (cls) {
+        case LOW_BYTE:
+        case HIGH_BYTE: return r;  // a byte register stays itself
+        case DWORD: return reg(EAX + r / 2);
+        case QWORD: return reg(RAX + r / 2);
+        }
+        return NO_REGISTER;
+    }
+    bool wide = (r >= EAX && r <= ESP) || (r >= RAX && r <= RSP);
+    if (!wide) return NO_REGISTER;
+    unsigned int family = r % 16;
+    switch (cls) {
+    case LOW_BYTE: return hasByteForms(family) ? reg(2 * family + 1) : NO_REGISTER;
+    case HIGH_BYTE: return hasByteForms(family) ? reg(2 * family) : NO_REGISTER;
+    case DWORD: return reg(EAX + family);
+    case QWORD: return reg(RAX + family);
+    }
+    return NO_REGISTER;
+}
+
+bool DecompileASM::isRegisterOfClass(AsmRegister r, RegClass cls) {
+    switch (cls) {
+    case LOW_BYTE: return r <= DL;
+    case HIGH_BYTE: return false;
+    case DWORD: return r >= EAX && r <= ESP;
+    case QWORD: return r >= RAX && r <= RSP;
+    }
+    return false;
+}
+
+// A byte register reserves its own number and the family's wider forms (not
+// the other byte register); a wider register of a, b, c or d reserves both
+// byte registers as well. bp and sp are never tracked.
+void DecompileASM::markRegister(AsmRegister r, bool flag) {
+    unsigned int family;
+    if (r < 8) {
+        family = r / 2;
+        regInUse[r] = flag;
+    } else if ((r >= AX && r <= SI) || (r >= EAX && r <= ESI) || (r >= RAX && r <= RSI)) {
+        family = r % 16;
+        if (hasByteForms(family)) {
+            regInUse[2 * family] = flag;
+            regInUse[2 * family + 1] = flag;
+        }
+    } else {
+        return;
+    }
+    regInUse[AX + family] = flag;
+    regInUse[EAX + family] = flag;
+    regInUse[RAX + family] = flag;
+}
+
+void DecompileASM::evict(ExprBase* holder) {
+    if (ExprAnnotation* a = annotationOf(holder)) {
+        a->reg = NO_REGISTER;
+        a->isIndirect = false;
+        a->isAddressBase = false;
+        a->isAssigned = false;
+    }
+}
+
+// Evicts every holder of r in any width, then clears r's reservation.
+void DecompileASM::freeRegister(AsmRegister r) {
+    if (r == NO_REGISTER) return;
+    for (ExprBase*& holder : regHolders) {
+        if (!holder) continue;
+        ExprAnnotation* a = annotationOf(holder);
+        AsmRegister held = a ? a->reg : NO_REGISTER;
+        if (r == registerOfClass(held, LOW_BYTE) || r == registerOfClass(held, HIGH_BYTE) ||
+            r == registerOfClass(held, DWORD) || r == registerOfClass(held, QWORD)) {
+            evict(holder);
+            holder = nullptr;
+        }
+    }
+    markRegister(r, false);
+}
+
+AsmRegister DecompileASM::claimRegister(AsmRegister r) {
+    freeRegister(r);
+    markRegister(r, true);
+    return r;
+}
+
+void DecompileASM::resetRegisters() {
+    for (bool& f : regInUse) f = false;
+    for (ExprBase*& holder : regHolders) {
+        if (!holder) continue;
+        evict(holder);
+        holder = nullptr;
+    }
+}
+
+// Between statements: a local temporary that has lost its register keeps its
+// slot (with isAssigned cleared, so it may be stolen from); everything else
+// is released.
+void DecompileASM::releaseStatementRegisters(StmtBase* stmt) {
+    if (!stmt || stmt->getNodeType() == SEQ_NODE) return;
+    for (ExprBase*& holder : regHolders) {
+        if (!holder) continue;
+        ExprAnnotation* a = annotationOf(holder);
+        AsmRegister held = a ? a->reg : NO_REGISTER;
+        if (holder->getNodeType() == TEMP_NODE && static_cast<TEMP*>(holder)->getType() != ARGUMENT_TEMP &&
+            held == NO_REGISTER) {
+            if (a) a->isAssigned = false;
+            continue;
+        }
+        markRegister(held, false);
+        evict(holder);
+        holder = nullptr;
+    }
+}
+
+AsmRegister DecompileASM::allocateByte() {
+    for (unsigned int r = AH; r <= DL; ++r)
+        if (!regInUse[r]) return claimRegister(reg(r));
+    return stealRegister(LOW_BYTE);
+}
+
+AsmRegister DecompileASM::allocateDword() {
+    for (unsigned int r = EAX; r <= EDX; ++r)
+        if (!regInUse[r]) return claimRegister(reg(r));
+    return stealRegister(DWORD);
+}
+
+AsmRegister DecompileASM::allocateQword() {
+    for (unsigned int r = RAX; r <= RDX; ++r)
+        if (!regInUse[r]) return claimRegister(reg(r));
+    return stealRegister(QWORD);
+}
+
+namespace {
+enum Width { BYTE_WIDTH, DWORD_WIDTH, QWORD_WIDTH, NO_WIDTH };
+// Register width by DataType.
+const Width widthOfType[DATA_TYPE_COUNT] = {
+    BYTE_WIDTH,   // CHAR_U
+    DWORD_WIDTH,  // INT_U
+    QWORD_WIDTH,  // INT64_U
+    BYTE_WIDTH,   // CHAR_S
+    DWORD_WIDTH,  // INT_S
+    QWORD_WIDTH,  // INT64_S
+    DWORD_WIDTH,  // FLOAT
+    QWORD_WIDTH,  // DOUBLE
+    DWORD_WIDTH,  // POINTER
+    NO_WIDTH,     // VOID
+};
+Width widthOf(const ExprBase* e) {
+    unsigned int t = e ? static_cast<unsigned int>(e->getDataType()) : DATA_TYPE_COUNT;
+    return t < DATA_TYPE_COUNT ? widthOfType[t] : NO_WIDTH;
+}
+}  // namespace
+
+AsmRegister DecompileASM::allocateForType(ExprBase* e) {
+    switch (widthOf(e)) {
+    case BYTE_WIDTH: return allocateByte();
+    case DWORD_WIDTH: return allocateDword();
+    case QWORD_WIDTH: return allocateQword();
+    case NO_WIDTH: return NO_REGISTER;
+    }
+    return NO_REGISTER;
+}
+
+// Takes a register from a temporary that merely caches its value. Holders
+// normally have isAssigned set, so with every register of a width reserved
+// this usually yields NO_REGISTER: values are never spilled.
+AsmRegister DecompileASM::stealRegister(RegClass cls) {
+    for (ExprBase* holder : regHolders) {
+        if (!holder || holder->getNodeType() != TEMP_NODE) continue;
+        ExprAnnotation* a = annotationOf(holder);
+        if (a && !a->isAssigned && !a->isAddressBase && isRegisterOfClass(a->reg, cls)) return claimRegister(a->reg);
+    }
+    for (ExprBase* holder : regHolders) {
+        if (!holder || holder->getNodeType() != TEMP_NODE) continue;
+        ExprAnnotation* a = annotationOf(holder);
+        if (a && !a->isAssigned) {
+            AsmRegister r = a->reg;
+            AsmRegister nr = registerOfClass(r, cls);
+            freeRegister(r);
+            return claimRegister(nr);
+        }
+    }
+    return NO_REGISTER;
+}
+
+// Records e as living in r; reservations are left as they are.
+void DecompileASM::assignRegister(ExprBase* e, AsmRegister r, bool indirect) {
+    if (!e) return;
+    ExprAnnotation* a = ensureAnnotation(e);
+    if (e->getNodeType() == MEM_NODE) {
+        for (ExprBase* holder : regHolders) {
+            if (!holder || holder->getNodeType() != TEMP_NODE) continue;
+            ExprAnnotation* h = annotationOf(holder);
+            if (h && h->reg == r) h->isAddressBase = true;
+        }
+    }
+    if (a->reg == NO_REGISTER) {
+        for (ExprBase*& holder : regHolders) {
+            if (!holder) {
+                holder = e;
+                break;
+            }
+        }
+    }
+    a->reg = r;
+    a->isIndirect = indirect;
+    a->isAssigned = true;
+}
+
+// A value already in a register is only resized to its type's width (and
+// reserved when claim is set, which also drops e from the holders); otherwise
+// it is loaded into a fresh register.
+AsmRegister DecompileASM::loadIntoRegister(ExprBase* e, bool claim) {
+    if (!e) return NO_REGISTER;
+    ExprAnnotation* a = annotationOf(e);
+    if (a && a->reg != NO_REGISTER) {
+        AsmRegister r = a->reg;
+        switch (widthOf(e)) {
+        case BYTE_WIDTH: r = registerOfClass(r, LOW_BYTE); break;
+        case DWORD_WIDTH: r = registerOfClass(r, DWORD); break;
+        case QWORD_WIDTH: r = registerOfClass(r, QWORD); break;
+        case NO_WIDTH: break;
+        }
+        a->reg = r;
+        if (claim) claimRegister(r);
+        return r;
+    }
+    AsmRegister r = allocateForType(e);
+    line() << "mov ";
+    putReg(r);
+    put(", ");
+    putOperand(e, true);
+    endLine();
+    assignRegister(e, r, false);
+    return r;
+}
+
+}  // namespace ZOA

@@ -1,0 +1,292 @@
+// The assembly emitter's statements: labels, sequences, moves, jumps and conditional jumps.
+#include "emit/x86/decompile_asm.h"
+
+#include <zoa/stmt.h>
+
+#include <ostream>
+
+namespace ZOA {
+
+namespace {
+
+bool isKind(ExprBase* e, NodeType k) { return e && e->getNodeType() == k; }
+
+bool isAddressedByBinop(ExprBase* e) {
+    return isKind(e, MEM_NODE) && isKind(static_cast<MEM*>(e)->getExpr(), BINOP_NODE);
+}
+
+bool isByteType(ExprBase* e) { return e && (e->getDataType() == CHAR_U || e->getDataType() == CHAR_S); }
+
+bool isDwordRegister(AsmRegister r) { return r >= EAX && r <= ESP; }
+
+// The operand shapes that select a MOVE row.
+enum Shape { ANY, TEMP_SHAPE, MEM_ANY, MEM_BINOP, MEM_OTHER, BINOP_SHAPE };
+
+bool matches(Shape s, ExprBase* e) {
+    switch (s) {
+    case ANY: return true;
+    case TEMP_SHAPE: return isKind(e, TEMP_NODE);
+    case MEM_ANY: return isKind(e, MEM_NODE);
+    case MEM_BINOP: return isAddressedByBinop(e);
+    case MEM_OTHER: return isKind(e, MEM_NODE) && !isAddressedByBinop(e);
+    case BINOP_SHAPE: return isKind(e, BINOP_NODE);
+    }
+    return false;
+}
+
+// By relOp: the conditional jump mnemonic, null for a non-relation.
+const char* jumpMnemonic(BinopKind rel) {
+    static const char* const mnemonics[] = {"je ", "jne ", "jl ", "jle ", "jg ", "jge "};
+    unsigned int i = static_cast<unsigned int>(rel);
+    return i >= EQ && i <= GE ? mnemonics[i - EQ] : nullptr;
+}
+
+}  // namespace
+
+void DecompileASM::visit(LABEL* l) {
+    curLabel = l;
+    putLabel(l);
+    put(":");
+    endLine();
+    resetRegisters();
+    if (l->containsStmts())
+        for (StmtBase* s : l->getStmts())
+            if (s) s->accept(this);
+    if (l->getKind() == EPILOGUE_LABEL) writeEpilogue();
+}
+
+void DecompileASM::visit(SEQ* s) {
+    for (StmtBase* part : {s->getLeft(), s->getRight()}) {
+        if (!part) continue;
+        releaseStatementRegisters(part);
+        part->accept(this);
+    }
+}
+
+void DecompileASM::visit(EXP* e) { visitExpr(e->getExpr()); }
+
+void DecompileASM::visit(JUMP* j) {
+    switch (j->getKind()) {
+    case DIRECT_LABEL:
+        if (fallsThrough(j) || !j->getTarget()) return;
+        line() << "jmp ";
+        putLabel(j->getTarget());
+        endLine();
+        return;
+    case DIRECT_EXPR:
+        visitExpr(j->getExpr());
+        line() << "jmp ";
+        putOperand(j->getExpr(), true);
+        endLine();
+        return;
+    }
+}
+
+// The first row whose destination and source shapes match applies.
+void DecompileASM::visit(MOVE* m) {
+    struct Row {
+        Shape dst;
+        Shape src;
+        void (DecompileASM::*emit)(ExprBase*, ExprBase*);
+    };
+    static const Row rows[] = {
+        {TEMP_SHAPE, TEMP_SHAPE, &DecompileASM::moveTempTemp},
+        {TEMP_SHAPE, MEM_BINOP, &DecompileASM::moveTempFromAddress},
+        {TEMP_SHAPE, MEM_OTHER, &DecompileASM::moveTempFromMem},
+        {MEM_BINOP, TEMP_SHAPE, &DecompileASM::moveTempToAddress},
+        {MEM_OTHER, TEMP_SHAPE, &DecompileASM::moveTempToMem},
+        {MEM_ANY, MEM_ANY, &DecompileASM::moveMemMem},
+        {TEMP_SHAPE, BINOP_SHAPE, &DecompileASM::moveTempFromBinop},
+        {ANY, ANY, &DecompileASM::moveOther},
+    };
+    writeNodeComment(m);
+    ExprBase* d = m->getDst();
+    ExprBase* s = m->getSrc();
+    for (const Row& row : rows) {
+        if (matches(row.dst, d) && matches(row.src, s)) {
+            (this->*row.emit)(d, s);
+            return;
+        }
+    }
+}
+
+void DecompileASM::moveTempTemp(ExprBase* d, ExprBase* s) {
+    visitExpr(s);
+    visitExpr(d);
+    AsmRegister r = loadIntoRegister(s, false);
+    line() << "mov ";
+    putOperand(d, false);
+    put(", ");
+    putReg(r);
+    endLine();
+    assignRegister(d, r, false);
+}
+
+void DecompileASM::moveTempFromAddress(ExprBase* d, ExprBase* s) {
+    visitExpr(d);
+    AsmRegister r = loadFromAddress(static_cast<MEM*>(s));
+    line() << "mov ";
+    putOperand(d, false);
+    put(", ");
+    putReg(r);
+    endLine();
+    assignRegister(d, r, false);
+}
+
+void DecompileASM::moveTempFromMem(ExprBase* d, ExprBase* s) {
+    visitExpr(s);
+    visitExpr(d);
+    ExprAnnotation* sa = annotationOf(s);
+    AsmRegister R = sa ? sa->reg : NO_REGISTER;
+    line() << "mov ";
+    putReg(R);
+    put(", ");
+    putOperand(s, true);
+    endLine();
+    line() << "mov ";
+    putOperand(d, false);
+    put(", ");
+    putReg(R);
+    endLine();
+    claimRegister(R);
+    assignRegister(d, R, false);
+}
+
+void DecompileASM::moveTempToAddress(ExprBase* d, ExprBase* s) {
+    visitExpr(s);
+    AsmRegister r = loadIntoRegister(s, false);
+    claimRegister(r);
+    storeToAddress(static_cast<MEM*>(d), r);
+}
+
+void DecompileASM::moveTempToMem(ExprBase* d, ExprBase* s) {
+    visitExpr(s);
+    visitExpr(d);
+    AsmRegister r = loadIntoRegister(s, false);
+    line() << "mov ";
+    putOperand(d, true);
+    put(", ");
+    putReg(r);
+    endLine();
+}
+
+void DecompileASM::moveMemMem(ExprBase* d, ExprBase* s) {
+    visitExpr(s);
+    visitExpr(d);
+    ExprAnnotation* sa = annotationOf(s);
+    ExprAnnotation* da = annotationOf(d);
+    AsmRegister R = sa ? sa->reg : NO_REGISTER;
+    line() << "mov ";
+    putReg(R);
+    put(", ");
+    putReg(R, true);
+    endLine();
+    line() << "mov ";
+    putReg(da ? da->reg : NO_REGISTER, true);
+    put(", ");
+    putReg(R);
+    endLine();
+}
+
+void DecompileASM::moveTempFromBinop(ExprBase* d, ExprBase* s) {
+    visitExpr(s);
+    visitExpr(d);
+    BINOP* b = static_cast<BINOP*>(s);
+    ExprAnnotation* sa = annotationOf(s);
+    AsmRegister R = sa ? sa->reg : NO_REGISTER;
+    line() << "mov ";
+    putOperand(d, false);
+    put(", ");
+    if (d != b->getLeft() && d != b->getRight() && isByteType(d) && isDwordRegister(R)) {
+        put("BYTE PTR ");
+        putReg(registerOfClass(R, LOW_BYTE));
+    } else {
+        putOperand(s, true);
+    }
+    endLine();
+    assignRegister(d, R, false);
+}
+
+void DecompileASM::moveOther(ExprBase* d, ExprBase* s) {
+    visitExpr(s);
+    visitExpr(d);
+    bool toTemp = isKind(d, TEMP_NODE);
+    ExprAnnotation* sa = annotationOf(s);
+    AsmRegister R = sa ? sa->reg : NO_REGISTER;
+    line() << "mov ";
+    putOperand(d, !toTemp);
+    put(", ");
+    if (R == NO_REGISTER || !isByteType(d) || !isDwordRegister(R)) {
+        putOperand(s, true);
+    } else {
+        put("BYTE PTR ");
+        putReg(registerOfClass(R, LOW_BYTE));
+    }
+    endLine();
+    if (toTemp && R != NO_REGISTER) assignRegister(d, R, false);
+}
+
+// Brings the operands into a comparable form, compares, jumps to ifTrue and,
+// unless ifFalse is the next label printed, to ifFalse.
+void DecompileASM::visit(CJUMP* c) {
+    ExprBase* l = c->getLeft();
+    ExprBase* r = c->getRight();
+    if (isKind(l, MEM_NODE) && isKind(r, MEM_NODE)) {
+        if (isAddressedByBinop(l) && isAddressedByBinop(r)) {
+            // Neither operand is prepared; both are written as they stand.
+        } else if (isAddressedByBinop(l)) {
+            assignRegister(l, loadAddressedValue(static_cast<MEM*>(l)), false);
+            visitExpr(r);
+        } else if (isAddressedByBinop(r)) {
+            visitExpr(l);
+            assignRegister(r, loadAddressedValue(static_cast<MEM*>(r)), false);
+        } else {
+            visitExpr(l);
+            visitExpr(r);
+            AsmRegister x = allocateForType(r);
+            line() << "mov ";
+            put(sizePrefix(r));
+            putReg(x);
+            put(", ");
+            putOperand(r, true);
+            endLine();
+            assignRegister(r, x, false);
+        }
+    } else if (isKind(l, TEMP_NODE) && isKind(r, MEM_NODE)) {
+        visitExpr(l);
+        loadIntoRegister(l, false);
+        if (isAddressedByBinop(r)) assignRegister(r, loadAddressedValue(static_cast<MEM*>(r)), false);
+        else visitExpr(r);
+    } else if (isKind(l, MEM_NODE) && isKind(r, TEMP_NODE)) {
+        if (isAddressedByBinop(l)) {
+            assignRegister(l, loadAddressedValue(static_cast<MEM*>(l)), false);
+            visitExpr(r);
+        } else {
+            visitExpr(l);
+            visitExpr(r);
+        }
+    } else {
+        visitExpr(l);
+        visitExpr(r);
+        loadIntoRegister(l, false);
+    }
+
+    line() << "cmp ";
+    putOperand(l, true);
+    put(", ");
+    putOperand(r, true);
+    endLine();
+
+    if (c->getIfTrue()) {
+        if (const char* mnemonic = jumpMnemonic(c->getRelOp())) line() << mnemonic;
+        putLabel(c->getIfTrue());
+        endLine();
+    }
+    if (!fallsThrough(c) && c->getIfFalse()) {
+        line() << "jmp ";
+        putLabel(c->getIfFalse());
+        endLine();
+    }
+}
+
+}  // namespace ZOA

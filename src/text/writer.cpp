@@ -1,0 +1,505 @@
+// Text writer: prints a unit in the form the reader rebuilds it from, ids and order preserved.
+#include "text/names.h"
+
+#include <zoa/text.h>
+#include <zoa/zoa.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+#include <cstring>
+#include <map>
+#include <ostream>
+#include <sstream>
+#include <unordered_map>
+
+namespace ZOA::text {
+
+namespace {
+
+constexpr int GLOBAL = -1;
+
+struct Owner {
+    int sub;  // GLOBAL for file-level names
+    unsigned int id;
+};
+
+void writeText(std::ostream& os, const char* s, std::size_t n) {
+    os << '"';
+    for (std::size_t i = 0; i < n; ++i) {
+        unsigned char c = static_cast<unsigned char>(s[i]);
+        switch (c) {
+            case '"': os << "\\\""; break;
+            case '\\': os << "\\\\"; break;
+            case '\n': os << "\\n"; break;
+            case '\t': os << "\\t"; break;
+            case '\r': os << "\\r"; break;
+            default:
+                if (c < 0x20 || c >= 0x7f) {
+                    char buf[8];
+                    std::snprintf(buf, sizeof buf, "\\x%02x", c);
+                    os << buf;
+                } else {
+                    os << static_cast<char>(c);
+                }
+        }
+    }
+    os << '"';
+}
+
+class Writer {
+public:
+    Writer(std::ostream& os, const ZOA_file& unit) : os(os), unit(unit) {}
+    void run();
+
+private:
+    std::ostream& os;
+    const ZOA_file& unit;
+    std::vector<SUBPROG*> subs;
+    std::unordered_map<const TEMP*, Owner> temps;
+    std::unordered_map<const LABEL*, Owner> labels;
+    std::unordered_map<const NAME*, Owner> names;
+    std::vector<std::map<unsigned int, LABEL*>> dead;  // referenced labels no longer in their map
+
+    void ref(char letter, Owner o, int ctx) {
+        if (o.sub != GLOBAL && o.sub != ctx) os << 's' << o.sub << ':';
+        os << letter << o.id;
+    }
+    void label(LABEL* l, int ctx) {
+        auto it = labels.find(l);
+        if (!l || it == labels.end()) {
+            os << "nil";
+            return;
+        }
+        ref('L', it->second, ctx);
+    }
+    void constant(CONST* c);
+    void expr(ExprBase* e, int ctx);
+    void stmt(StmtBase* s, int ctx, int depth);
+    void nameDef(NAME* n, int ctx);
+    void subprog(std::size_t i);
+    void global(NAME* n);
+
+    // Calls f on every temp, name and label an expression or statement mentions.
+    template <class F> void scan(TreeBase* t, F&& f);
+    void collectDead(std::size_t i, TreeBase* t);
+};
+
+template <class F> void Writer::scan(TreeBase* root, F&& f) {
+    std::vector<TreeBase*> todo{root};
+    while (!todo.empty()) {
+        TreeBase* t = todo.back();
+        todo.pop_back();
+        if (!t) continue;
+        switch (t->getNodeType()) {
+            case BINOP_NODE:
+                todo.push_back(static_cast<BINOP*>(t)->getLeft());
+                todo.push_back(static_cast<BINOP*>(t)->getRight());
+                break;
+            case UNOP_NODE: todo.push_back(static_cast<UNOP*>(t)->getExpr()); break;
+            case MEM_NODE: todo.push_back(static_cast<MEM*>(t)->getExpr()); break;
+            case CALL_NODE:
+                todo.push_back(static_cast<CALL*>(t)->getFunctionPointer());
+                for (ExprBase* a : static_cast<CALL*>(t)->getArgs()) todo.push_back(a);
+                break;
+            case NAME_NODE: {
+                NAME* n = static_cast<NAME*>(t);
+                f(t);
+                if (n->getLabelRef()) f(n->getLabelRef());
+                break;
+            }
+            case TEMP_NODE:
+            case BUF_TEMP_NODE: f(t); break;
+            case EXP_NODE: todo.push_back(static_cast<EXP*>(t)->getExpr()); break;
+            case MOVE_NODE:
+                todo.push_back(static_cast<MOVE*>(t)->getDst());
+                todo.push_back(static_cast<MOVE*>(t)->getSrc());
+                break;
+            case SEQ_NODE:
+                todo.push_back(static_cast<SEQ*>(t)->getLeft());
+                todo.push_back(static_cast<SEQ*>(t)->getRight());
+                break;
+            case JUMP_NODE:
+                todo.push_back(static_cast<JUMP*>(t)->getExpr());
+                if (LABEL* l = static_cast<JUMP*>(t)->getTarget()) f(l);
+                break;
+            case CJUMP_NODE: {
+                CJUMP* c = static_cast<CJUMP*>(t);
+                todo.push_back(c->getLeft());
+                todo.push_back(c->getRight());
+                if (c->getIfTrue()) f(c->getIfTrue());
+                if (c->getIfFalse()) f(c->getIfFalse());
+                break;
+            }
+            case CONST_NODE:
+            case TREE_BASE_NODE:
+            case EXPR_BASE_NODE:
+            case STMT_BASE_NODE:
+            case LABEL_NODE:
+            case SUBPROG_NODE:
+                break;
+        }
+    }
+}
+
+// A label that was freed but is still jumped to is declared dead in the
+// subprogram that mentions it, so the reference can be written by id.
+void Writer::collectDead(std::size_t i, TreeBase* t) {
+    scan(t, [&](TreeBase* x) {
+        if (x->getNodeType() != LABEL_NODE) return;
+        LABEL* l = static_cast<LABEL*>(x);
+        if (labels.count(l) || dead[i].count(l->getId()) || subs[i]->getAllLabels().count(l->getId())) return;
+        dead[i][l->getId()] = l;
+        labels[l] = {static_cast<int>(i), l->getId()};
+    });
+}
+
+void Writer::constant(CONST* c) {
+    DataType t = c->getDataType();
+    os << "(CONST " << spell(t) << ' ';
+    char buf[64];
+    if (t == FLOAT || t == DOUBLE) {
+        double v = c->getFValue();
+        if (std::isnan(v)) {
+            os << "nan";
+        } else if (std::isinf(v)) {
+            os << (v < 0 ? "-inf" : "inf");
+        } else {
+            std::snprintf(buf, sizeof buf, "%.17g", v);
+            os << buf;
+            if (!std::strpbrk(buf, ".e")) os << ".0";
+        }
+    } else if (t == POINTER) {
+        const char* p = static_cast<const char*>(c->getPValue());
+        if (p)
+            writeText(os, p, std::strlen(p));
+        else
+            os << "null";
+    } else if (t == INT64_U) {
+        std::snprintf(buf, sizeof buf, "%llu", static_cast<unsigned long long>(c->getIValue()));
+        os << buf;
+    } else {
+        std::snprintf(buf, sizeof buf, "%lld", c->getIValue());
+        os << buf;
+    }
+    os << ')';
+}
+
+void Writer::expr(ExprBase* e, int ctx) {
+    if (!e) {
+        os << "nil";
+        return;
+    }
+    switch (e->getNodeType()) {
+        case CONST_NODE: constant(static_cast<CONST*>(e)); return;
+        case BINOP_NODE: {
+            BINOP* b = static_cast<BINOP*>(e);
+            os << "(BINOP " << spell(b->getDataType()) << ' ' << spell(b->getOp()) << ' ';
+            expr(b->getLeft(), ctx);
+            os << ' ';
+            expr(b->getRight(), ctx);
+            os << ')';
+            return;
+        }
+        case UNOP_NODE: {
+            UNOP* u = static_cast<UNOP*>(e);
+            os << "(UNOP " << spell(u->getDataType()) << ' ' << spell(u->getOp()) << ' ';
+            expr(u->getExpr(), ctx);
+            os << ')';
+            return;
+        }
+        case MEM_NODE:
+            os << "(MEM " << spell(e->getDataType()) << ' ';
+            expr(static_cast<MEM*>(e)->getExpr(), ctx);
+            os << ')';
+            return;
+        case CALL_NODE: {
+            CALL* c = static_cast<CALL*>(e);
+            os << "(CALL " << spell(c->getDataType()) << ' ';
+            if (c->getFunctionPointer())
+                expr(c->getFunctionPointer(), ctx);
+            else
+                writeText(os, c->getFunctionName().data(), c->getFunctionName().size());
+            if (c->isCallStatic()) os << " static";
+            for (ExprBase* a : c->getArgs()) {
+                os << ' ';
+                expr(a, ctx);
+            }
+            os << ')';
+            return;
+        }
+        case NAME_NODE: {
+            NAME* n = static_cast<NAME*>(e);
+            auto it = names.find(n);
+            if (it != names.end()) {
+                ref(it->second.sub == GLOBAL ? 'g' : 'n', it->second, ctx);
+            } else if (n->getLabelRef()) {
+                os << "(NAME ";
+                label(n->getLabelRef(), ctx);
+                os << (n->isDeclaredLocal() ? " local)" : ")");
+            } else {
+                os << "(unknown-name " << n->getId() << ')';
+            }
+            return;
+        }
+        case TEMP_NODE:
+        case BUF_TEMP_NODE: {
+            TEMP* t = static_cast<TEMP*>(e);
+            auto it = temps.find(t);
+            if (it != temps.end())
+                ref('t', it->second, ctx);
+            else if (e->getNodeType() == BUF_TEMP_NODE)
+                os << "(BUF_TEMP " << t->getId() << ' ' << static_cast<BUF_TEMP*>(t)->getArraySize() << ')';
+            else
+                os << "(unknown-temp " << t->getId() << ')';
+            return;
+        }
+        case TREE_BASE_NODE:
+        case EXPR_BASE_NODE:
+        case STMT_BASE_NODE:
+        case CJUMP_NODE:
+        case EXP_NODE:
+        case JUMP_NODE:
+        case LABEL_NODE:
+        case MOVE_NODE:
+        case SEQ_NODE:
+        case SUBPROG_NODE:
+            break;
+    }
+    os << "(unknown-node)";
+}
+
+void Writer::stmt(StmtBase* s, int ctx, int depth) {
+    if (!s) {
+        os << "nil";
+        return;
+    }
+    switch (s->getNodeType()) {
+        case MOVE_NODE:
+            os << "(MOVE ";
+            expr(static_cast<MOVE*>(s)->getDst(), ctx);
+            os << ' ';
+            expr(static_cast<MOVE*>(s)->getSrc(), ctx);
+            os << ')';
+            return;
+        case EXP_NODE:
+            os << "(EXP ";
+            expr(static_cast<EXP*>(s)->getExpr(), ctx);
+            os << ')';
+            return;
+        case SEQ_NODE:
+            os << "(SEQ ";
+            stmt(static_cast<SEQ*>(s)->getLeft(), ctx, depth + 1);
+            os << ' ';
+            stmt(static_cast<SEQ*>(s)->getRight(), ctx, depth + 1);
+            os << ')';
+            return;
+        case JUMP_NODE: {
+            JUMP* j = static_cast<JUMP*>(s);
+            os << "(JUMP ";
+            if (j->getKind() == DIRECT_LABEL) {
+                if (!j->getTarget()) os << "label ";
+                label(j->getTarget(), ctx);
+            } else {
+                if (!j->getExpr()) os << "expr ";
+                expr(j->getExpr(), ctx);
+            }
+            os << ')';
+            return;
+        }
+        case CJUMP_NODE: {
+            CJUMP* c = static_cast<CJUMP*>(s);
+            os << "(CJUMP " << spell(c->getRelOp()) << ' ';
+            expr(c->getLeft(), ctx);
+            os << ' ';
+            expr(c->getRight(), ctx);
+            os << ' ';
+            label(c->getIfTrue(), ctx);
+            os << ' ';
+            label(c->getIfFalse(), ctx);
+            os << ')';
+            return;
+        }
+        case TREE_BASE_NODE:
+        case EXPR_BASE_NODE:
+        case BINOP_NODE:
+        case BUF_TEMP_NODE:
+        case CALL_NODE:
+        case CONST_NODE:
+        case MEM_NODE:
+        case NAME_NODE:
+        case TEMP_NODE:
+        case UNOP_NODE:
+        case STMT_BASE_NODE:
+        case LABEL_NODE:
+        case SUBPROG_NODE:
+            break;
+    }
+    os << "(unknown-node)";
+}
+
+void Writer::nameDef(NAME* n, int ctx) {
+    const ExprList& l = n->getList();
+    const String& text = n->getStringValue();
+    if (n->getKind() == STATIC_DATA_REF && l.size() == 1 && l.front() && text.empty() &&
+        l.front()->getNodeType() == CONST_NODE && l.front()->getDataType() == n->getDataType()) {
+        constant(static_cast<CONST*>(l.front()));
+    } else if (n->getKind() == CONST_ARRAY_REF && text.empty()) {
+        os << "(values";
+        for (ExprBase* e : l) {
+            os << ' ';
+            expr(e, ctx);
+        }
+        os << ')';
+    } else {
+        os << spell(n->getKind()) << ' ';
+        writeText(os, text.data(), text.size());
+    }
+}
+
+void Writer::global(NAME* n) {
+    os << "  (name g" << names[n].id << ' ';
+    nameDef(n, GLOBAL);
+    os << (n->isDeclaredLocal() ? " local)\n" : ")\n");
+}
+
+void Writer::subprog(std::size_t i) {
+    SUBPROG* sp = subs[i];
+    int ctx = static_cast<int>(i);
+    os << "  (subprog s" << i << ' ';
+    writeText(os, sp->getName().data(), sp->getName().size());
+    os << ' ' << spell(sp->getReturnType());
+    if (sp->isStatic()) os << " static";
+    if (sp->isExtern()) os << " extern";
+    auto proto = unit.getSubprogPrototypes().find(std::string(sp->getName().data(), sp->getName().size()));
+    if (proto != unit.getSubprogPrototypes().end() && proto->second == sp) os << " prototype";
+    os << '\n';
+    const TempList& args = sp->getAllArgTemps();
+    for (TEMP* t : sp->getAllTemps()) {
+        if (t == sp->getReturnTemp()) {
+            if (t->getState() != PERMANENT_TEMP) os << "    (return t" << t->getId() << ' ' << spell(t->getState()) << ")\n";
+        } else if (t->getNodeType() == BUF_TEMP_NODE) {
+            os << "    (buffer t" << t->getId() << ' ' << static_cast<BUF_TEMP*>(t)->getArraySize();
+            if (t->getState() != IN_USE_TEMP) os << ' ' << spell(t->getState());
+            os << ")\n";
+        } else {
+            bool arg = std::find(args.begin(), args.end(), t) != args.end();
+            os << (arg ? "    (arg t" : "    (temp t") << t->getId() << ' ' << spell(t->getDataType());
+            if (t->getState() != (arg ? PERMANENT_TEMP : IN_USE_TEMP)) os << ' ' << spell(t->getState());
+            os << ")\n";
+        }
+    }
+    // Labels by id, live or dead: the reader recreates them in this order.
+    std::map<unsigned int, std::pair<LABEL*, bool>> all;
+    for (auto& [id, l] : sp->getAllLabels()) all[id] = {l, true};
+    for (auto& [id, l] : dead[i]) all[id] = {l, false};
+    // The start and return labels exist from construction; say so if they were freed.
+    for (unsigned int id = 0; id < 2; ++id)
+        if (!sp->getAllLabels().count(id) && !dead[i].count(id)) os << "    (dead L" << id << ")\n";
+    for (auto& [id, e] : all) {
+        if (id < 2 && e.second) continue;
+        os << (e.second ? "    (label L" : "    (dead L") << id;
+        if (e.first->getKind() != REGULAR_LABEL) os << ' ' << spell(e.first->getKind());
+        os << ")\n";
+    }
+    for (NAME* n : sp->getAllLocalNames()) {
+        os << "    (name n" << n->getId() << ' ';
+        nameDef(n, ctx);
+        os << ")\n";
+    }
+    for (auto& [id, e] : all) {
+        if (e.first->getStmts().empty()) continue;
+        os << "    (block L" << id;
+        for (StmtBase* s : e.first->getStmts()) {
+            os << "\n      ";
+            stmt(s, ctx, 0);
+        }
+        os << ")\n";
+    }
+    os << "  )\n";
+}
+
+void Writer::run() {
+    subs.assign(unit.getSubprogs().begin(), unit.getSubprogs().end());
+    dead.resize(subs.size());
+    for (std::size_t i = 0; i < subs.size(); ++i) {
+        int s = static_cast<int>(i);
+        for (TEMP* t : subs[i]->getAllTemps()) temps.emplace(t, Owner{s, t->getId()});
+        for (auto& [id, l] : subs[i]->getAllLabels()) labels.emplace(l, Owner{s, id});
+        for (NAME* n : subs[i]->getAllLocalNames()) names.emplace(n, Owner{s, n->getId()});
+    }
+    for (NAME* n : unit.getNames()) names.emplace(n, Owner{GLOBAL, n->getId()});
+    for (std::size_t i = 0; i < subs.size(); ++i) {
+        for (auto& [id, l] : subs[i]->getAllLabels())
+            for (StmtBase* s : l->getStmts()) collectDead(i, s);
+        for (NAME* n : subs[i]->getAllLocalNames())
+            for (ExprBase* e : n->getList()) collectDead(i, e);
+    }
+    for (std::size_t i = 0; i < subs.size(); ++i)
+        for (auto& [id, l] : dead[i])
+            for (StmtBase* s : l->getStmts()) collectDead(i, s);
+
+    os << "(unit " << (unit.IsGcc() ? "gcc" : "msvc") << (unit.IsAsmMode() ? " asm\n" : "\n");
+    // Call prototypes first: no subprogram exists yet, so each one is recorded.
+    for (auto& [key, call] : unit.getCallPrototypes()) {
+        os << "  (prototype " << spell(call->getDataType()) << ' ';
+        writeText(os, key.data(), key.size());
+        if (call->isCallStatic()) os << " static";
+        for (ExprBase* a : call->getArgs()) os << ' ' << (a ? spell(a->getDataType()) : std::string("VOID"));
+        os << ")\n";
+    }
+
+    // File-level names go as early as what they mention allows; a subprogram
+    // reference waits for its subprogram unless it was recorded as a prototype.
+    std::vector<NAME*> globals(unit.getNames().begin(), unit.getNames().end());
+    auto firstSub = [&](const String& name) {
+        for (std::size_t i = 0; i < subs.size(); ++i)
+            if (subs[i]->getName() == name) return static_cast<int>(i);
+        return -1;
+    };
+    std::vector<int> after(globals.size(), -1);
+    for (std::size_t g = 0; g < globals.size(); ++g) {
+        NAME* n = globals[g];
+        for (ExprBase* e : n->getList())
+            scan(e, [&](TreeBase* x) {
+                int owner = -1;
+                if (x->getNodeType() == LABEL_NODE) {
+                    auto it = labels.find(static_cast<LABEL*>(x));
+                    if (it != labels.end()) owner = it->second.sub;
+                } else if (x->getNodeType() == NAME_NODE) {
+                    auto it = names.find(static_cast<NAME*>(x));
+                    if (it != names.end()) owner = it->second.sub;
+                } else {
+                    auto it = temps.find(static_cast<TEMP*>(x));
+                    if (it != temps.end()) owner = it->second.sub;
+                }
+                if (owner > after[g]) after[g] = owner;
+            });
+        if (n->getKind() == SUBPROG_REF) {
+            std::string text(n->getStringValue().data(), n->getStringValue().size());
+            auto p = unit.getNamePrototypes().find(text);
+            int s = firstSub(n->getStringValue());
+            if (s >= 0 && (p == unit.getNamePrototypes().end() || p->second != n) && s > after[g]) after[g] = s;
+        }
+    }
+    std::size_t g = 0, s = 0;
+    while (g < globals.size() || s < subs.size()) {
+        if (g < globals.size() && (after[g] < static_cast<int>(s) || s == subs.size()))
+            global(globals[g++]);
+        else
+            subprog(s++);
+    }
+    os << ")\n";
+}
+
+}  // namespace
+
+void write(std::ostream& os, const ZOA_file& unit) { Writer(os, unit).run(); }
+
+std::string write(const ZOA_file& unit) {
+    std::ostringstream os;
+    write(os, unit);
+    return os.str();
+}
+
+}  // namespace ZOA::text
