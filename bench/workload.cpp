@@ -37,7 +37,7 @@ void buildWorkload(ZOA_file& unit, const Shape& shape) {
 }
 
 void keepHeapMapped() {
-    mallopt(M_MMAP_THRESHOLD, 1 << 30);
+    mallopt(M_MMAP_THRESHOLD, 32 << 20);  // the largest glibc accepts
     mallopt(M_TRIM_THRESHOLD, 1 << 30);
 }
 

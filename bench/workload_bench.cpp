@@ -68,11 +68,13 @@ template <Output K> void BM_Output(benchmark::State& state) {
     Shape shape = shapeOf(state);
     QuietStdout quiet;
     std::size_t bytes = 0;
+    bench::StringSink sink;
+    std::ostream os(&sink);
     for (auto _ : state) {
         state.PauseTiming();
         ZOA_file unit(true, K == ASM);
         bench::buildWorkload(unit, shape);
-        std::ostringstream os;
+        sink.clear();
         state.ResumeTiming();
         switch (K) {
         case C_GCC:
@@ -81,7 +83,7 @@ template <Output K> void BM_Output(benchmark::State& state) {
         case DOT: unit.dumpDot(os); break;
         }
         state.PauseTiming();
-        bytes = static_cast<std::size_t>(os.tellp());
+        bytes = sink.text.size();
         state.ResumeTiming();
         if (bytes == 0) {
             // An output that writes nothing would spin through millions of builds.

@@ -44,7 +44,8 @@ PhaseTimes runLlvm(const Shape& shape) {
         ir.CreateRet(a);
     }
     double t1 = nowNs();
-    std::string text;
+    static std::string text;  // reused across runs: its capacity stays
+    text.clear();
     llvm::raw_string_ostream os(text);
     module->print(os, nullptr);
     os.flush();
