@@ -16,13 +16,8 @@ struct Arena {
     std::list<void*> oversized;                   // dedicated blocks of large requests
 };
 
-// The current block's free bytes, at namespace scope (zero-initialised, no
-// guard) so that the fast path is a compare and an add.
-struct Bump {
-    char* next;  // first free byte of the current block
-    char* end;   // one past the current block
-};
-Bump bump = {nullptr, nullptr};
+// Short name for the bump pointer the inline fast path works on.
+MemMgr::Bump& bump = MemMgr::bump;
 
 // Never destroyed: blocks stay reachable (and are never freed) until the process ends.
 Arena& arena() {
@@ -90,21 +85,19 @@ void MemMgr::rewind() {
     enterBlock(a);
 }
 
-namespace {
+MemMgr::Bump MemMgr::bump = {nullptr, nullptr};
 
-// Slow path: a fresh block, an oversized request, or the arena's first use.
-// Typed requests leave room for their alignment when judged oversized.
-void* allocateSlow(std::size_t size, std::size_t align, bool typed) {
+// A fresh block, an oversized request, or the arena's first use.
+void* MemMgr::allocateSlow(std::size_t size, std::size_t align, bool typed) {
     Arena& a = arena();
-    if ((typed ? size + align : size) > MemMgr::BLOCK_SIZE) return allocateOversized(a, size, align);
+    // Typed requests leave room for their alignment when judged oversized.
+    if ((typed ? size + align : size) > BLOCK_SIZE) return allocateOversized(a, size, align);
     if (!bump.next || static_cast<std::size_t>(bump.end - bump.next) < padding(bump.next, align) + size)
         advanceBlock(a);
     char* p = bump.next + padding(bump.next, align);
     bump.next = p + size;
     return p;
 }
-
-}  // namespace
 
 void* MemMgr::allocate(unsigned int size) {
     char* p = bump.next;
@@ -113,17 +106,6 @@ void* MemMgr::allocate(unsigned int size) {
         return p;
     }
     return allocateSlow(size, 1, false);
-}
-
-void* MemMgr::allocateAligned(std::size_t size, std::size_t align) {
-    char* p = bump.next;
-    std::size_t pad = padding(p, align);
-    if (p && size + align <= BLOCK_SIZE && pad + size <= static_cast<std::size_t>(bump.end - p)) {
-        p += pad;
-        bump.next = p + size;
-        return p;
-    }
-    return allocateSlow(size, align, true);
 }
 
 void MemMgr::deallocate(void*, unsigned int) {}
