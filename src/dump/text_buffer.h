@@ -2,8 +2,9 @@
 #ifndef ZOA_DUMP_TEXT_BUFFER_H
 #define ZOA_DUMP_TEXT_BUFFER_H
 
+#include "core/short_copy.h"
+
 #include <cstddef>
-#include <cstdint>
 #include <cstring>
 #include <memory>
 
@@ -16,7 +17,7 @@ class TextBuffer {
 public:
     void append(const char* s, std::size_t n) {
         if (n > capacity - used) grow(n);
-        copy(storage.get() + used, s, n);
+        copyShort(storage.get() + used, s, n);
         used += n;
     }
     // n copies of c.
@@ -43,28 +44,6 @@ public:
     void clear() { used = 0; }
 
 private:
-    // Short pieces (names, operators, numbers) are copied inline with two
-    // overlapping loads and stores instead of a call to the library's memcpy.
-    static void copy(char* d, const char* s, std::size_t n) {
-        if (n >= 8 && n <= 16) {
-            std::uint64_t a, b;
-            std::memcpy(&a, s, 8);
-            std::memcpy(&b, s + n - 8, 8);
-            std::memcpy(d, &a, 8);
-            std::memcpy(d + n - 8, &b, 8);
-        } else if (n >= 4 && n < 8) {
-            std::uint32_t a, b;
-            std::memcpy(&a, s, 4);
-            std::memcpy(&b, s + n - 4, 4);
-            std::memcpy(d, &a, 4);
-            std::memcpy(d + n - 4, &b, 4);
-        } else if (n < 4) {
-            for (std::size_t i = 0; i < n; ++i) d[i] = s[i];
-        } else {
-            std::memcpy(d, s, n);
-        }
-    }
-
     void grow(std::size_t n) {
         std::size_t want = capacity * 2 > used + n ? capacity * 2 : used + n;
         if (want < 4096) want = 4096;

@@ -2,6 +2,8 @@
 #ifndef ZOA_EMIT_TEXT_OUT_H
 #define ZOA_EMIT_TEXT_OUT_H
 
+#include "core/short_copy.h"
+
 #include <zoa/memmgr.h>
 
 #include <cstddef>
@@ -42,7 +44,7 @@ public:
         if (depth == 0) {
             os.write(p, static_cast<std::streamsize>(n));
         } else if (n <= CAPACITY - used) {
-            std::memcpy(buf.get() + used, p, n);
+            copyShort(buf.get() + used, p, n);
             used += n;
         } else {
             flush();
