@@ -1,6 +1,8 @@
 // Workload W(F,B,S), built through the public API.
 #include "workload.h"
 
+#include <malloc.h>
+
 #include <string>
 #include <vector>
 
@@ -32,6 +34,11 @@ void buildWorkload(ZOA_file& unit, const Shape& shape) {
         }
         ret->addStmt(new MOVE(sp->getReturnTemp(), a));
     }
+}
+
+void keepHeapMapped() {
+    mallopt(M_MMAP_THRESHOLD, 32 << 20);  // the largest glibc accepts
+    mallopt(M_TRIM_THRESHOLD, 1 << 30);
 }
 
 }  // namespace ZOA::bench

@@ -6,6 +6,7 @@
 
 #include <climits>
 #include <cstddef>
+#include <cstdint>
 #include <list>
 #include <map>
 #include <set>
@@ -38,7 +39,17 @@ public:
     // Returns size fresh bytes, adjacent to the previous request when it fits.
     static void* allocate(unsigned int size);
     // Returns size bytes whose address is a multiple of align (a power of two).
-    static void* allocateAligned(std::size_t size, std::size_t align);
+    // The common case, a request that fits the current block, is a bump of
+    // the pointer done inline; everything else goes to allocateSlow.
+    static void* allocateAligned(std::size_t size, std::size_t align) {
+        char* p = bump.next;
+        std::size_t pad = (std::uintptr_t(0) - reinterpret_cast<std::uintptr_t>(p)) & (align - 1);
+        if (p && size + align <= BLOCK_SIZE && pad + size <= static_cast<std::size_t>(bump.end - p)) {
+            bump.next = p + pad + size;
+            return p + pad;
+        }
+        return allocateSlow(size, align, true);
+    }
     // Does nothing: arena memory is only given up wholesale by a rewind.
     static void deallocate(void* p, unsigned int size);
     // Bytes handed out from the current block plus the current block's index,
@@ -48,6 +59,17 @@ public:
     static void rewind();
 
     MemMgr& operator=(const MemMgr&) { return *this; }
+
+    // The current block's free bytes (both null before the first block).
+    struct Bump {
+        char* next;  // first free byte
+        char* end;   // one past the block
+    };
+    static Bump bump;
+
+private:
+    // typed: the request came through allocateAligned (see the choices above).
+    static void* allocateSlow(std::size_t size, std::size_t align, bool typed);
 };
 
 // A stateless allocator over the arena, for containers held by nodes.

@@ -47,7 +47,10 @@ public:
     const char* getComment() const { return nullptr; }
     void setComment(const std::string&) {}
 
-    static void* operator new(std::size_t size);
+    // Nodes hold pointers, 64-bit integers and doubles: 8-byte alignment.
+    static void* operator new(std::size_t size) {
+        return MemMgr::allocateAligned(size, alignof(std::max_align_t) < 8 ? alignof(std::max_align_t) : 8);
+    }
     static void operator delete(void*, std::size_t) noexcept {}
 
 protected:

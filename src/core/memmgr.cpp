@@ -13,10 +13,11 @@ namespace {
 struct Arena {
     std::list<char*> memBlkPtrs;                  // every block, in the order obtained
     std::list<char*>::iterator currentMemBlkPtr;  // the block being filled
-    char* next = nullptr;                         // first free byte of the current block
-    char* end = nullptr;                          // one past the current block
     std::list<void*> oversized;                   // dedicated blocks of large requests
 };
+
+// Short name for the bump pointer the inline fast path works on.
+MemMgr::Bump& bump = MemMgr::bump;
 
 // Never destroyed: blocks stay reachable (and are never freed) until the process ends.
 Arena& arena() {
@@ -31,8 +32,8 @@ char* obtainBlock(std::size_t size) {
 }
 
 void enterBlock(Arena& a) {
-    a.next = *a.currentMemBlkPtr;
-    a.end = a.next + MemMgr::BLOCK_SIZE;
+    bump.next = *a.currentMemBlkPtr;
+    bump.end = bump.next + MemMgr::BLOCK_SIZE;
 }
 
 // Obtains the first block and makes it current; dedicated blocks stay as they are.
@@ -47,7 +48,7 @@ char* advanceBlock(Arena& a) {
     if (a.memBlkPtrs.empty()) {
         // First use before any unit: a rewind here would free dedicated blocks still in use.
         prime(a);
-        return a.next;
+        return bump.next;
     }
     ++a.currentMemBlkPtr;
     if (a.currentMemBlkPtr == a.memBlkPtrs.end()) {
@@ -55,11 +56,11 @@ char* advanceBlock(Arena& a) {
         a.currentMemBlkPtr = std::prev(a.memBlkPtrs.end());
     }
     enterBlock(a);
-    return a.next;
+    return bump.next;
 }
 
 std::size_t padding(const char* at, std::size_t align) {
-    return (align - reinterpret_cast<std::uintptr_t>(at) % align) % align;
+    return (0 - reinterpret_cast<std::uintptr_t>(at)) & (align - 1);
 }
 
 // A block of its own, released at the next rewind, holding size bytes at the alignment asked.
@@ -84,26 +85,27 @@ void MemMgr::rewind() {
     enterBlock(a);
 }
 
-void* MemMgr::allocate(unsigned int size) {
+MemMgr::Bump MemMgr::bump = {nullptr, nullptr};
+
+// A fresh block, an oversized request, or the arena's first use.
+void* MemMgr::allocateSlow(std::size_t size, std::size_t align, bool typed) {
     Arena& a = arena();
-    if (size > BLOCK_SIZE) return allocateOversized(a, size);
-    if (a.next && static_cast<std::size_t>(a.end - a.next) >= size) {
-        char* p = a.next;
-        a.next += size;
-        return p;
-    }
-    char* p = advanceBlock(a);
-    a.next = p + size;
+    // Typed requests leave room for their alignment when judged oversized.
+    if ((typed ? size + align : size) > BLOCK_SIZE) return allocateOversized(a, size, align);
+    if (!bump.next || static_cast<std::size_t>(bump.end - bump.next) < padding(bump.next, align) + size)
+        advanceBlock(a);
+    char* p = bump.next + padding(bump.next, align);
+    bump.next = p + size;
     return p;
 }
 
-void* MemMgr::allocateAligned(std::size_t size, std::size_t align) {
-    Arena& a = arena();
-    if (size + align > BLOCK_SIZE) return allocateOversized(a, size, align);
-    if (!a.next || static_cast<std::size_t>(a.end - a.next) < padding(a.next, align) + size) advanceBlock(a);
-    char* p = a.next + padding(a.next, align);
-    a.next = p + size;
-    return p;
+void* MemMgr::allocate(unsigned int size) {
+    char* p = bump.next;
+    if (p && size <= static_cast<std::size_t>(bump.end - p)) {
+        bump.next = p + size;
+        return p;
+    }
+    return allocateSlow(size, 1, false);
 }
 
 void MemMgr::deallocate(void*, unsigned int) {}
@@ -111,7 +113,7 @@ void MemMgr::deallocate(void*, unsigned int) {}
 unsigned int MemMgr::getMemoryUsage() {
     Arena& a = arena();
     if (a.memBlkPtrs.empty()) return 0u - 1u;
-    unsigned int used = static_cast<unsigned int>(a.next - *a.currentMemBlkPtr);
+    unsigned int used = static_cast<unsigned int>(bump.next - *a.currentMemBlkPtr);
     unsigned int index = static_cast<unsigned int>(std::distance(a.memBlkPtrs.begin(), a.currentMemBlkPtr));
     return used + index - 1u;
 }

@@ -4,11 +4,6 @@
 
 namespace ZOA {
 
-namespace {
-// Nodes hold pointers, 64-bit integers and doubles.
-constexpr std::size_t NODE_ALIGN = alignof(std::max_align_t) < 8 ? alignof(std::max_align_t) : 8;
-}  // namespace
-
 TreeAnnotation::~TreeAnnotation() {}
 
 // Annotations are client classes: give them what global operator new promises.
@@ -18,8 +13,6 @@ void* TreeAnnotation::operator new(std::size_t size, std::align_val_t align) {
     std::size_t a = static_cast<std::size_t>(align);
     return MemMgr::allocateAligned(size, a > alignof(std::max_align_t) ? a : alignof(std::max_align_t));
 }
-
-void* TreeBase::operator new(std::size_t size) { return MemMgr::allocateAligned(size, NODE_ALIGN); }
 
 void TreeBase::setAnnotation(TreeAnnotation* a, bool deleteOld) {
     if (deleteOld && annotation) delete annotation;

@@ -3,6 +3,7 @@
 #define ZOA_DUMP_DOT_DUMP_DOT_H
 
 #include "dump/dot/node_set.h"
+#include "dump/text_buffer.h"
 
 #include <zoa/all_visitor.h>
 #include <zoa/enums.h>
@@ -41,7 +42,7 @@ public:
     struct Workspace {
         std::vector<TreeBase*> nodesByKind[NODE_TYPE_COUNT];
         NodeSet declaredOnce;
-        std::string text;  // DOT text not yet handed to the stream
+        TextBuffer text;  // DOT text not yet handed to the stream
     };
 
     DumpDot(SUBPROG* subprog, std::ostream& out, Workspace* workspace = nullptr);
@@ -98,7 +99,7 @@ private:
     std::unique_ptr<Workspace> ownWorkspace;
     Workspace& workspace;
     std::vector<TreeBase*>* nodesByKind;  // workspace.nodesByKind
-    std::string& text;
+    TextBuffer& text;
     SUBPROG* subprog;
     std::ostream& out;
     bool plainNumbers;  // out formats integers as bare decimal digits

@@ -32,26 +32,18 @@ float narrowToFloat(double v) {
 
 }  // namespace
 
-DecompileC::DecompileC(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc) {}
+DecompileC::DecompileC(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc), sink(os) {}
 DecompileC::~DecompileC() {}
 
-void DecompileC::writeInt(long long v) {
-    char buf[32];
-    int n = std::snprintf(buf, sizeof buf, "%lld", v);
-    out.write(buf, n);
-}
+void DecompileC::writeInt(long long v) { sink.writeInt(v); }
 
-void DecompileC::writeUnsigned(unsigned long long v) {
-    char buf[32];
-    int n = std::snprintf(buf, sizeof buf, "%llu", v);
-    out.write(buf, n);
-}
+void DecompileC::writeUnsigned(unsigned long long v) { sink.writeUnsigned(v); }
 
-void DecompileC::writeTypeName(DataType t) { out << ctext::typeName(t); }
+void DecompileC::writeTypeName(DataType t) { sink << ctext::typeName(t); }
 
-void DecompileC::writeBinopText(BinopKind op) { out << ' ' << ctext::binopText(op) << ' '; }
+void DecompileC::writeBinopText(BinopKind op) { sink << ' ' << ctext::binopText(op) << ' '; }
 
-void DecompileC::writeUnopText(UnopKind op) { out << ctext::unopText(op); }
+void DecompileC::writeUnopText(UnopKind op) { sink << ctext::unopText(op); }
 
 void DecompileC::printFlat(ExprBase* e) {
     if (!e) return;
@@ -65,47 +57,47 @@ void DecompileC::writeOperand(ExprBase* e) {
     if (!e) return;
     NodeType t = e->getNodeType();
     bool bare = t == TEMP_NODE || t == BUF_TEMP_NODE || t == CONST_NODE;
-    if (!bare) out << '(';
+    if (!bare) sink << '(';
     printFlat(e);
-    if (!bare) out << ')';
+    if (!bare) sink << ')';
 }
 
 void DecompileC::writeDataPrefix(NAME* n) {
-    out << (n->isDeclaredLocal() ? "nl" : "ng");
+    sink << (n->isDeclaredLocal() ? "nl" : "ng");
     writeUnsigned(n->getId());
 }
 
 void DecompileC::visit(TEMP* t) {
-    indent(indentLevel) << 't';
+    pad(indentLevel) << 't';
     writeUnsigned(t->getId());
 }
 
 void DecompileC::visit(BUF_TEMP* t) {
-    indent(indentLevel) << 't';
+    pad(indentLevel) << 't';
     writeUnsigned(t->getId());
 }
 
 void DecompileC::visit(CONST* c) {
-    indent(indentLevel);
+    pad(indentLevel);
     long long v = c->getIValue();
     std::uint32_t low = static_cast<std::uint32_t>(v);
     char buf[64];
     int n = 0;
     switch (c->getDataType()) {
     case CHAR_U:
-        out << "(unsigned char)";
+        sink << "(unsigned char)";
         writeUnsigned(low);
         return;
     case INT_U:
         writeUnsigned(low);
-        out << 'U';
+        sink << 'U';
         return;
     case INT64_U:
         writeUnsigned(static_cast<unsigned long long>(v));
-        out << "LL";
+        sink << "LL";
         return;
     case CHAR_S:
-        out << "(char)";
+        sink << "(char)";
         writeInt(static_cast<std::int32_t>(low));
         return;
     case INT_S:
@@ -113,20 +105,20 @@ void DecompileC::visit(CONST* c) {
         return;
     case INT64_S:
         writeInt(v);
-        out << "LL";
+        sink << "LL";
         return;
     case FLOAT:
         // What an ostream with default flags writes for the float.
         n = std::snprintf(buf, sizeof buf, "%.*g", 6, static_cast<double>(narrowToFloat(c->getFValue())));
-        out.write(buf, n);
+        sink.write(buf, static_cast<std::size_t>(n));
         return;
     case DOUBLE:
         n = std::snprintf(buf, sizeof buf, "%#.17G", c->getFValue());
-        out.write(buf, n);
+        sink.write(buf, static_cast<std::size_t>(n));
         return;
     case POINTER:
-        if (const char* text = static_cast<const char*>(c->getPValue())) out << text;
-        else out << "(char *)0";
+        if (const char* text = static_cast<const char*>(c->getPValue())) sink << text;
+        else sink << "(char *)0";
         return;
     case VOID:
         return;
@@ -136,11 +128,11 @@ void DecompileC::visit(CONST* c) {
 void DecompileC::visit(NAME* n) {
     switch (n->getKind()) {
     case LABEL_REF:
-        out << "&&LAB";
+        sink << "&&LAB";
         writeUnsigned(n->getId());
         return;
     case SUBPROG_REF:
-        out << "(void *)" << n->getStringValue();
+        sink << "(void *)" << n->getStringValue();
         return;
     case CONST_ARRAY_REF:
     case DATA_ARRAY_REF:
@@ -149,84 +141,84 @@ void DecompileC::visit(NAME* n) {
     case STATIC_DATA_REF:
         // Made from a constant: no text, defined under its generated name.
         if (n->getStringValue().empty()) break;
-        out << n->getStringValue();
+        sink << n->getStringValue();
         return;
     case EXTERN_DATA_REF:
-        out << n->getStringValue();
+        sink << n->getStringValue();
         return;
     }
     writeDataPrefix(n);
 }
 
 void DecompileC::visit(MEM* m) {
-    indent(indentLevel) << "*((";
+    pad(indentLevel) << "*((";
     writeTypeName(m->getDataType());
-    out << "*)";
+    sink << "*)";
     writeOperand(m->getExpr());
-    out << ')';
+    sink << ')';
 }
 
 void DecompileC::visit(UNOP* u) {
     ExprBase* x = u->getExpr();
-    out << '(';
+    sink << '(';
     if (u->getOp() == ABS) {
         writeOperand(x);
-        out << ">=0?";
+        sink << ">=0?";
         writeOperand(x);
-        out << ": -";
+        sink << ": -";
         writeOperand(x);
     } else {
         writeUnopText(u->getOp());
-        out << '(';
+        sink << '(';
         writeOperand(x);
-        out << ')';
+        sink << ')';
     }
-    out << ')';
+    sink << ')';
 }
 
 void DecompileC::visit(BINOP* b) {
-    out << '(';
+    sink << '(';
     writeOperand(b->getLeft());
     writeBinopText(b->getOp());
     writeOperand(b->getRight());
-    out << ')';
+    sink << ')';
 }
 
 void DecompileC::writeArgTypes(CALL* c) {
     bool first = true;
     for (ExprBase* a : c->getArgs()) {
-        if (!first) out << ", ";
+        if (!first) sink << ", ";
         first = false;
         if (a) writeTypeName(a->getDataType());
     }
 }
 
 void DecompileC::writeArgList(CALL* c) {
-    out << '(';
+    sink << '(';
     bool first = true;
     for (ExprBase* a : c->getArgs()) {
-        if (!first) out << ", ";
+        if (!first) sink << ", ";
         first = false;
         printFlat(a);
     }
-    out << ')';
+    sink << ')';
 }
 
 void DecompileC::visit(CALL* c) {
-    indent(indentLevel);
+    pad(indentLevel);
     if (TEMP* fp = c->getFunctionPointer()) {
-        out << "((";
+        sink << "((";
         writeTypeName(c->getDataType());
-        out << " (*)(";
+        sink << " (*)(";
         writeArgTypes(c);
-        out << "))";
+        sink << "))";
         writeOperand(fp);
-        out << ')';
+        sink << ')';
     } else {
         const String& name = c->getFunctionName();
         // These two return untyped memory; the cast keeps the C well typed.
-        if (sameText(name, "alloca") || sameText(name, "malloc")) out << "(char *)";
-        out << name;
+        if (sameText(name, "alloca") || sameText(name, "malloc")) sink << "(char *)";
+        sink << name;
     }
     writeArgList(c);
 }

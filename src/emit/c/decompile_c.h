@@ -3,6 +3,7 @@
 #define ZOA_EMIT_C_DECOMPILE_C_H
 
 #include "emit/decompile_base.h"
+#include "emit/text_out.h"
 #include "emit/used_nodes.h"
 
 #include <zoa/enums.h>
@@ -87,7 +88,11 @@ private:
     void writeInt(long long v);
     void writeUnsigned(unsigned long long v);
 
+    // Indentation into sink (the base's indent writes to the stream directly).
+    TextOut& pad(unsigned int n) { return sink.indent(n); }
+
     UsedMap usedMap;  // reused across subprograms
+    TextOut sink;     // everything this emitter writes goes through it
 };
 
 }  // namespace ZOA

@@ -41,17 +41,17 @@ void DecompileC::printStmt(StmtBase* s) {
 
 void DecompileC::writeGoto(LABEL* target, unsigned int level) {
     if (!target) {
-        indent(level) << ";\n";
+        pad(level) << ";\n";
         return;
     }
-    indent(level) << "goto LAB";
+    pad(level) << "goto LAB";
     writeUnsigned(target->getId());
-    out << ";\n";
+    sink << ";\n";
 }
 
 void DecompileC::visit(EXP* e) {
     if (ExprBase* x = e->getExpr()) x->accept(this);
-    out << ";\n";
+    sink << ";\n";
 }
 
 void DecompileC::visit(SEQ* s) {
@@ -64,21 +64,21 @@ void DecompileC::visit(MOVE* m) {
     ExprBase* src = m->getSrc();
     NAME* label = isGcc ? nullptr : asLabelAddress(src);
     if (label) {
-        indent(indentLevel) << "__asm {\n";
-        indent(indentLevel + 1) << "MOV EAX, LAB";
+        pad(indentLevel) << "__asm {\n";
+        pad(indentLevel + 1) << "MOV EAX, LAB";
         writeUnsigned(label->getId());
-        out << '\n';
+        sink << '\n';
         if (dst && dst->getNodeType() == MEM_NODE) {
-            indent(indentLevel + 1) << "MOV EDX, [";
+            pad(indentLevel + 1) << "MOV EDX, [";
             printFlat(static_cast<MEM*>(dst)->getExpr());
-            out << "]\n";
-            indent(indentLevel + 1) << "MOV [EDX], EAX\n";
+            sink << "]\n";
+            pad(indentLevel + 1) << "MOV [EDX], EAX\n";
         } else {
-            indent(indentLevel + 1) << "MOV ";
+            pad(indentLevel + 1) << "MOV ";
             printFlat(dst);
-            out << ", EAX\n";
+            sink << ", EAX\n";
         }
-        indent(indentLevel) << "};\n";
+        pad(indentLevel) << "};\n";
         return;
     }
     if (dst) {
@@ -86,10 +86,10 @@ void DecompileC::visit(MOVE* m) {
         dst->accept(this);
         indentLevel = saved;
     }
-    out << " = ";
-    if (needsCharPointerCast(src)) out << "(char *)";
+    sink << " = ";
+    if (needsCharPointerCast(src)) sink << "(char *)";
     printFlat(src);
-    out << ";\n";
+    sink << ";\n";
 }
 
 void DecompileC::visit(JUMP* j) {
@@ -99,9 +99,9 @@ void DecompileC::visit(JUMP* j) {
     }
     ExprBase* e = j->getExpr();
     if (isGcc) {
-        indent(indentLevel) << "goto *";
+        pad(indentLevel) << "goto *";
         printFlat(e);
-        out << ";\n";
+        sink << ";\n";
         return;
     }
     MEM* mem = e && e->getNodeType() == MEM_NODE ? static_cast<MEM*>(e) : nullptr;
@@ -112,89 +112,90 @@ void DecompileC::visit(JUMP* j) {
             addr->accept(this);
             indentLevel = saved;
         }
-        out << " = ";
+        sink << " = ";
         printFlat(mem);
-        out << ";\n";
+        sink << ";\n";
     }
-    indent(indentLevel) << "__asm {\n";
-    indent(indentLevel + 1) << "JMP ";
+    pad(indentLevel) << "__asm {\n";
+    pad(indentLevel + 1) << "JMP ";
     if (mem) {
-        out << '[';
+        sink << '[';
         printFlat(mem->getExpr());
-        out << ']';
+        sink << ']';
     } else {
         printFlat(e);
     }
-    out << '\n';
-    indent(indentLevel) << "}\n";
+    sink << '\n';
+    pad(indentLevel) << "}\n";
 }
 
 void DecompileC::visit(CJUMP* c) {
-    indent(indentLevel) << "if (";
+    pad(indentLevel) << "if (";
     printFlat(c->getLeft());
     writeBinopText(c->getRelOp());
     printFlat(c->getRight());
-    out << ")\n";
+    sink << ")\n";
     writeGoto(c->getIfTrue(), indentLevel + 1);
     if (fallsThrough(c)) return;
-    indent(indentLevel) << "else\n";
+    pad(indentLevel) << "else\n";
     writeGoto(c->getIfFalse(), indentLevel + 1);
 }
 
 void DecompileC::visit(LABEL* l) {
     curLabel = l;
-    out << "\nLAB";
+    sink << "\nLAB";
     writeUnsigned(l->getId());
-    out << ':';
+    sink << ':';
     if (l->containsStmts()) {
         for (StmtBase* s : l->getStmts()) printStmt(s);
     } else if (!curSubprog || l != curSubprog->getReturnLabel()) {
-        out << ';';
+        sink << ';';
     }
     if (l->getKind() != EPILOGUE_LABEL) return;
     if (curSubprog && curSubprog->getReturnType() != VOID) {
-        indent(indentLevel) << "return ";
+        pad(indentLevel) << "return ";
         printFlat(curSubprog->getReturnTemp());
-        out << ';';
+        sink << ';';
     } else {
-        indent(indentLevel) << "return;";
+        pad(indentLevel) << "return;";
     }
 }
 
 void DecompileC::declareTemp(TEMP* t) {
     if (!t) return;
-    indent(indentLevel);
+    pad(indentLevel);
     if (t->getNodeType() == BUF_TEMP_NODE) {
         unsigned long long size = static_cast<BUF_TEMP*>(t)->getArraySize();
-        out << "char t";
+        sink << "char t";
         writeUnsigned(t->getId());
-        out << '[';
+        sink << '[';
         writeUnsigned((size + 7) / 8 * 8);
-        out << ']';
+        sink << ']';
     } else {
         writeTypeName(t->getDataType());
-        out << 't';
+        sink << 't';
         writeUnsigned(t->getId());
     }
-    if (t->getType() != ARGUMENT_TEMP) out << ";\n";
+    if (t->getType() != ARGUMENT_TEMP) sink << ";\n";
 }
 
 void DecompileC::visit(SUBPROG* sp) {
-    if (sp->isStatic()) out << "static ";
-    if (sp->isExtern()) out << "extern ";
+    TextOut::Batch batch(sink);
+    if (sp->isStatic()) sink << "static ";
+    if (sp->isExtern()) sink << "extern ";
     writeTypeName(sp->getReturnType());
-    out << sp->getName() << '(';
+    sink << sp->getName() << '(';
 
     usedMap.clear();
     UsedNodes used(sp, &usedMap);
 
     bool first = true;
     for (TEMP* t : sp->getAllArgTemps()) {
-        if (!first) out << ", ";
+        if (!first) sink << ", ";
         first = false;
         declareTemp(t);
     }
-    out << ")\n{\n";
+    sink << ")\n{\n";
     ++indentLevel;
 
     // Locals: the used, non-argument temporaries in allTemps order, buffers first.
@@ -212,7 +213,7 @@ void DecompileC::visit(SUBPROG* sp) {
     buildTraces();
     for (LABEL* l : traceOrder) printLabel(l);
 
-    out << "\n}\n\n";
+    sink << "\n}\n\n";
     --indentLevel;
 }
 
@@ -223,18 +224,18 @@ void DecompileC::printLabel(LABEL* l) {
 }
 
 void DecompileC::writeQuotedString(const String& s) {
-    out << '"';
+    sink << '"';
     const char* p = s.data();
     std::size_t n = s.size();
     std::size_t runStart = 0;
     for (std::size_t i = 0; i < n; ++i) {
         if (p[i] != '"' || (i > 0 && p[i - 1] == '\\')) continue;
-        out.write(p + runStart, static_cast<std::streamsize>(i - runStart));
-        out << "\\\"";
+        sink.write(p + runStart, i - runStart);
+        sink << "\\\"";
         runStart = i + 1;
     }
-    out.write(p + runStart, static_cast<std::streamsize>(n - runStart));
-    out << '"';
+    sink.write(p + runStart, n - runStart);
+    sink << '"';
 }
 
 void DecompileC::defineName(NAME* n) {
@@ -246,78 +247,78 @@ void DecompileC::defineName(NAME* n) {
     case DATA_ARRAY_REF: {
         if (values.empty()) {
             // Nothing to size or type it by: a one-byte array keeps references valid.
-            indent(indentLevel) << "static char ";
+            pad(indentLevel) << "static char ";
             writeDataPrefix(n);
-            out << "[1];\n";
+            sink << "[1];\n";
             return;
         }
-        indent(indentLevel) << "static ";
+        pad(indentLevel) << "static ";
         if (firstValue) writeTypeName(firstValue->getDataType());
         writeDataPrefix(n);
         bool labelTable = firstValue && firstValue->getNodeType() == NAME_NODE &&
                           static_cast<NAME*>(firstValue)->getKind() == LABEL_REF;
         if (!isGcc && labelTable) {
-            out << '[';
+            sink << '[';
             writeUnsigned(values.size());
-            out << "];\n__asm {\n";
+            sink << "];\n__asm {\n";
             long long offset = 0;
             for (ExprBase* e : values) {
-                out << "MOV EAX, ";
+                sink << "MOV EAX, ";
                 if (NAME* l = asLabelAddress(e)) {
-                    out << "LAB";
+                    sink << "LAB";
                     writeUnsigned(l->getLabelRef()->getId());
                 } else {
                     printFlat(e);
                 }
-                out << ";\nMOV DWORD PTR ";
+                sink << ";\nMOV DWORD PTR ";
                 writeDataPrefix(n);
-                out << '+';
+                sink << '+';
                 writeInt(offset);
-                out << ", EAX;\n";
+                sink << ", EAX;\n";
                 offset += 4;
             }
-            out << "}\n";
+            sink << "}\n";
             return;
         }
-        out << "[] = {";
+        sink << "[] = {";
         bool first = true;
         for (ExprBase* e : values) {
-            if (!first) out << ", ";
+            if (!first) sink << ", ";
             first = false;
             NameKind k = e && e->getNodeType() == NAME_NODE ? static_cast<NAME*>(e)->getKind() : LABEL_REF;
-            if (k == SUBPROG_REF) out << "(void *)" << static_cast<NAME*>(e)->getStringValue();
+            if (k == SUBPROG_REF) sink << "(void *)" << static_cast<NAME*>(e)->getStringValue();
             else if (k == STRINGLIT_REF) writeQuotedString(static_cast<NAME*>(e)->getStringValue());
             else printFlat(e);
         }
-        out << "};\n";
+        sink << "};\n";
         return;
     }
     case STRINGLIT_REF:
-        indent(indentLevel) << "static const char *";
+        pad(indentLevel) << "static const char *";
         writeDataPrefix(n);
-        out << " = ";
+        sink << " = ";
         writeQuotedString(n->getStringValue());
-        out << ";\n";
+        sink << ";\n";
         return;
     case STATIC_DATA_REF:
-        indent(indentLevel) << "static ";
+        pad(indentLevel) << "static ";
         writeTypeName(n->getDataType());
         if (!firstValue) {
             // Made from a text: defined under the name references print.
             if (n->getStringValue().empty()) writeDataPrefix(n);
-            else out << n->getStringValue();
-            out << ";\n";
+            else sink << n->getStringValue();
+            sink << ";\n";
             return;
         }
         writeDataPrefix(n);
-        out << " = ";
+        sink << " = ";
         printFlat(firstValue);
-        out << ";\n";
+        sink << ";\n";
         return;
     case EXTERN_DATA_REF:
-        indent(indentLevel) << "extern ";
+        pad(indentLevel) << "extern ";
         writeTypeName(n->getDataType());
-        out << n->getStringValue() << ";\n";
+        sink << n->getStringValue() << ";\n";
         return;
     case LABEL_REF:
     case SUBPROG_REF:
@@ -327,31 +328,31 @@ void DecompileC::defineName(NAME* n) {
 
 void DecompileC::declareCallPrototype(CALL* c) {
     if (!c) return;
-    if (c->isCallStatic()) out << "static ";
+    if (c->isCallStatic()) sink << "static ";
     writeTypeName(c->getDataType());
-    out << c->getFunctionName() << '(';
+    sink << c->getFunctionName() << '(';
     writeArgTypes(c);
-    out << ");\n";
+    sink << ");\n";
 }
 
 void DecompileC::declareSubprogPrototype(SUBPROG* sp) {
     if (!sp) return;
-    if (sp->isStatic()) out << "static ";
-    if (sp->isExtern()) out << "extern ";
+    if (sp->isStatic()) sink << "static ";
+    if (sp->isExtern()) sink << "extern ";
     writeTypeName(sp->getReturnType());
-    out << sp->getName() << '(';
+    sink << sp->getName() << '(';
     bool first = true;
     for (TEMP* t : sp->getAllArgTemps()) {
-        if (!first) out << ", ";
+        if (!first) sink << ", ";
         first = false;
         if (t) writeTypeName(t->getDataType());
     }
-    out << ");\n";
+    sink << ");\n";
 }
 
 void DecompileC::declareNamePrototype(NAME* n) {
     if (!n) return;
-    out << "void " << n->getStringValue() << "();\n";
+    sink << "void " << n->getStringValue() << "();\n";
 }
 
 }  // namespace ZOA

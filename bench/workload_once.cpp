@@ -1,0 +1,25 @@
+// Builds workload W once and writes one output, for instruction counts under valgrind.
+#include "workload.h"
+
+#include <cstdlib>
+#include <cstring>
+#include <iostream>
+#include <sstream>
+
+// usage: zoa_workload_once build|c|asm|ascii|dot [F B S]
+int main(int argc, char** argv) {
+    using namespace ZOA;
+    const char* mode = argc > 1 ? argv[1] : "build";
+    bench::Shape shape{argc > 2 ? std::atoi(argv[2]) : 10, argc > 3 ? std::atoi(argv[3]) : 100,
+                       argc > 4 ? std::atoi(argv[4]) : 10};
+    ZOA_file unit(true, std::strcmp(mode, "asm") == 0);
+    bench::buildWorkload(unit, shape);
+    std::ostringstream os;
+    std::streambuf* saved = std::cout.rdbuf(nullptr);  // statistics go nowhere
+    if (!std::strcmp(mode, "c") || !std::strcmp(mode, "asm")) unit.decompile(os);
+    else if (!std::strcmp(mode, "ascii")) unit.dumpAscii(os);
+    else if (!std::strcmp(mode, "dot")) unit.dumpDot(os);
+    std::cout.rdbuf(saved);
+    std::cerr << mode << ": " << os.tellp() << " bytes, " << shape.totalStatements() << " statements\n";
+    return 0;
+}
