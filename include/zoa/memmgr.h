@@ -113,7 +113,7 @@ public:
     using Base::Base;
     String() = default;
     String(const Base& s) : Base(s) {}
-    String(const std::string& s) : Base(s.data(), s.size()) {}
+    explicit String(const std::string& s) : Base(s.data(), s.size()) {}
 
     operator std::string() const { return std::string(data(), size()); }
 
