@@ -240,7 +240,7 @@ CampaignStats runDifferential(const CampaignOptions& o) {
                         std::string prefix = batch[i].prefix, kind = f.kind;
                         f.reduced = shrink(f.text, [&](const std::string& t) {
                             return textFails(t, entries, prefix, o.workDir, o.optLevels, kind);
-                        }, 300);
+                        }, 800);
                         writeText(base + ".min.zoa", f.reduced);
                         if (o.log) *o.log << "  reduced: " << base << ".min.zoa\n";
                     }

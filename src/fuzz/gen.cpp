@@ -292,7 +292,7 @@ private:
                 static const BinopKind ops[] = {LSHIFT, RSHIFT};
                 bool wide = t == INT64_S || t == INT64_U;
                 BinopKind op = pick(ops);
-                DataType left = op == LSHIFT && chance(70) ? (wide ? INT64_U : INT_U) : t;
+                DataType left = op == LSHIFT && chance(92) ? (wide ? INT64_U : INT_U) : t;
                 ExprBase* count = new BINOP(INT_S, BITWISE_AND, expr(INT_S, depth - 1), intConst(INT_S, wide ? 63 : 31));
                 return new BINOP(t, op, expr(left, depth - 1), count);
             }

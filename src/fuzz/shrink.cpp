@@ -111,6 +111,8 @@ std::string shrink(const std::string& text, const std::function<bool(const std::
     Sx root;
     std::size_t i = 0;
     if (!parse(text, i, root, 0)) return text;
+    // First only drop statements and items (big steps), then also simplify expressions.
+    for (int phase = 0; phase < 2; ++phase) {
     bool progress = true;
     while (progress && budget > 0) {
         progress = false;
@@ -131,7 +133,7 @@ std::string shrink(const std::string& text, const std::function<bool(const std::
             bool subprogItem = head(*parent, "subprog") && node.list;
             bool unitItem = head(*parent, "unit") && node.list;
             if (!statementOfBlock && !subprogItem && !unitItem && !isExprForm(node)) continue;
-            if (isExprForm(node)) {
+            if (isExprForm(node) && phase == 1) {
                 Sx zero;
                 zero.list = true;
                 zero.kids.resize(3);
@@ -163,6 +165,7 @@ std::string shrink(const std::string& text, const std::function<bool(const std::
                 parent->kids[idx] = saved;
             }
         }
+    }
     }
     return print(root);
 }
