@@ -353,6 +353,9 @@ private:
         if (mode == Mode::C && chance(25)) {
             TEMP* fp = sp->getTemp(POINTER, 0, IN_USE_TEMP);
             add(new MOVE(fp, unit->getName(SUBPROG_REF, f.name.c_str())));
+            // The pointer's type comes from the arguments: they must match the parameters.
+            for (std::size_t k = 0; k < args.size(); ++k)
+                if (args[k]->getDataType() != f.params[k]) args[k] = constant(f.params[k]);
             c = new CALL(f.ret, fp, args);
         } else {
             c = new CALL(f.ret, f.name.c_str(), args);

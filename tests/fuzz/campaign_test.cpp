@@ -19,8 +19,8 @@ using namespace ZOA;
 TEST(Fuzz, DifferentialCampaignAgreesWithGcc) {
     fuzz::CampaignOptions o;
     o.firstSeed = 1;
-    o.seeds = 60;
-    o.batch = 60;
+    o.seeds = 200;
+    o.batch = 100;
     o.workDir = ZOA::testing::scratchDir();
     o.shrinkLimit = 0;
     std::ostringstream log;
@@ -54,7 +54,7 @@ TEST(Fuzz, GeneratedUnitsAreValidAndReproducible) {
 }
 
 TEST(Fuzz, OddTreesThroughEveryOutput) {
-    EXPECT_EQ(fuzz::runCrash(1, 150, nullptr), 150u);
+    EXPECT_EQ(fuzz::runCrash(1, 400, nullptr), 400u);
 }
 
 TEST(Fuzz, ShrinkKeepsWhatStillFails) {
