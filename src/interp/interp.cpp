@@ -367,6 +367,8 @@ struct Machine::Impl {
                             : isSigned(v.type) ? static_cast<long double>(static_cast<long long>(v.bits))
                                                : static_cast<long double>(v.bits);
             r.real = roundTo(to, x);
+            if (opt.strictC && std::isfinite(static_cast<double>(x)) && !std::isfinite(r.real))
+                stop(Status::UNDEFINED, "floating value out of the range of its new type");
             return r;
         }
         if (isReal(v.type)) {
@@ -423,7 +425,8 @@ struct Machine::Impl {
         Value r;
         r.type = t;
         r.real = roundTo(t, exact);
-        if (opt.strictC && static_cast<long double>(r.real) != exact && !std::isnan(static_cast<double>(exact)))
+        // The sign of a NaN the FPU makes is its own affair.
+        if (opt.strictC && (static_cast<long double>(r.real) != exact || std::isnan(r.real)))
             stop(Status::UNDEFINED, "floating result not exact in its type");
         return r;
     }
@@ -554,9 +557,13 @@ struct Machine::Impl {
                 if (!std::isfinite(f)) stop(Status::NO_MEANING, "non-finite constant");
                 std::ostringstream s;
                 s << f;
+                std::string text = s.str();
+                // 3.0 is written 3: an int literal, with int arithmetic.
+                if (text.find_first_of(".e") == std::string::npos)
+                    return Value::of(CType::INT, static_cast<std::uint64_t>(std::strtoll(text.c_str(), nullptr, 10)));
                 Value v;
                 v.type = CType::DOUBLE;
-                v.real = std::strtod(s.str().c_str(), nullptr);
+                v.real = std::strtod(text.c_str(), nullptr);
                 return v;
             }
             case DOUBLE:

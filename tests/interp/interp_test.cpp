@@ -147,6 +147,18 @@ TEST(Interp, LongLongLiteralsReadAsGccReadsThem) {
     // is a negative long long for gcc; so is the most negative INT64_S.
     EXPECT_EQ(run(expr("INT_S", "", "(BINOP INT_S GE (CONST INT64_U 9556173957450139454) (CONST INT64_U 127))"), "f"), "0");
     EXPECT_EQ(run(expr("INT_S", "", "(BINOP INT_S LE (CONST INT64_S -9223372036854775808) (CONST INT64_S 0))"), "f"), "1");
+    // Seed 100520: gcc -O2 printed -nan where -O0 printed nan. A NaN, or a
+    // double too large for a float, has no value to compare in strict mode.
+    const std::string big = "(BINOP DOUBLE MUL (CONST DOUBLE 1e300) (CONST DOUBLE 1e300))";
+    EXPECT_EQ(run(expr("FLOAT", "", "(CONST DOUBLE 1e300)"), "f", {}, true), "error: undefined in C");
+    EXPECT_EQ(run(expr("DOUBLE", "", "(BINOP DOUBLE MINUS " + big + " " + big + ")"), "f", {}, true),
+              "error: undefined in C");
+    EXPECT_EQ(run(expr("FLOAT", "", "(CONST DOUBLE 1e300)"), "f"), "inf");
+    // Seed 102717: a FLOAT constant with an integral value is written as an
+    // int literal, so -(0) is the int 0 and 7 / 2 divides as ints.
+    EXPECT_EQ(run(expr("FLOAT", "", "(UNOP FLOAT NEG (CONST FLOAT 0.0))"), "f"), "0");
+    EXPECT_EQ(run(expr("FLOAT", "", "(BINOP FLOAT DIV (CONST FLOAT 7.0) (CONST FLOAT 2.0))"), "f"), "3");
+    EXPECT_EQ(run(expr("FLOAT", "", "(BINOP FLOAT DIV (CONST FLOAT 7.5) (CONST FLOAT 2.0))"), "f"), "3.75");
 }
 
 }  // namespace
