@@ -1,9 +1,13 @@
 // zoa: reads a unit in the text form, verifies it and writes one of its outputs.
+#include <zoa/interp.h>
 #include <zoa/text.h>
 #include <zoa/verify.h>
 #include <zoa/zoa.h>
 
+#include <cctype>
+#include <cstdlib>
 #include <cstring>
+#include <vector>
 #include <fstream>
 #include <iostream>
 #include <iterator>
@@ -14,6 +18,7 @@ namespace {
 
 const char* const usage =
     "usage: zoa [--emit=c|c-msvc|asm|dot|ascii|text] [-o FILE] [--no-verify] FILE|-\n"
+    "       zoa --run=FUNC [ARG...] FILE|-\n"
     "Reads a unit in the text form (FILE, or standard input for -), verifies it\n"
     "and writes the chosen output (default: what the unit's flavour gives).\n"
     "  --emit=c       C, GCC flavour        --emit=c-msvc  C, MSVC flavour\n"
@@ -21,9 +26,40 @@ const char* const usage =
     "  --emit=ascii   indented tree dump    --emit=text    the text form again\n"
     "  -o FILE        write to FILE instead of standard output\n"
     "  --no-verify    skip the verifier\n"
+    "  --run=FUNC     interpret subprogram FUNC on the integer or real ARGs and\n"
+    "                 print its result (what the compiled C would return)\n"
     "Exit status: 0 success, 1 bad input, 2 bad usage.\n";
 
 const char* const emits[] = {"", "c", "c-msvc", "asm", "dot", "ascii", "text"};
+
+// Runs one subprogram through the interpreter and prints its value.
+int runSubprog(ZOA::ZOA_file& unit, const std::string& func, const std::vector<std::string>& args) {
+    std::vector<ZOA::interp::Value> values;
+    for (const std::string& a : args) {
+        char* end = nullptr;
+        long long i = std::strtoll(a.c_str(), &end, 0);
+        if (end && *end == '\0' && !a.empty()) {
+            values.push_back(ZOA::interp::Value::integer(ZOA::INT64_S, i));
+            continue;
+        }
+        double d = std::strtod(a.c_str(), &end);
+        if (a.empty() || !end || *end) {
+            std::cerr << "zoa: argument '" << a << "' is no number\n";
+            return 2;
+        }
+        values.push_back(ZOA::interp::Value::floating(ZOA::DOUBLE, d));
+    }
+    ZOA::interp::Options options;
+    options.out = &std::cout;
+    ZOA::interp::Result r = ZOA::interp::run(unit, func, values, options);
+    if (!r.ok()) {
+        std::cout.flush();
+        std::cerr << "zoa: " << func << ": " << ZOA::interp::toString(r.status) << ": " << r.message << '\n';
+        return 1;
+    }
+    std::cout << ZOA::interp::format(r.value) << '\n';
+    return 0;
+}
 
 int badUsage(const std::string& why) {
     std::cerr << "zoa: " << why << '\n' << usage;
@@ -33,7 +69,8 @@ int badUsage(const std::string& why) {
 }  // namespace
 
 int main(int argc, char** argv) {
-    std::string emit, output, input;
+    std::string emit, output, input, runFunc;
+    std::vector<std::string> runArgs;
     bool verifyIt = true, haveInput = false;
     for (int i = 1; i < argc; ++i) {
         std::string a = argv[i];
@@ -55,10 +92,13 @@ int main(int argc, char** argv) {
             output = argv[i];
         } else if (a == "--no-verify") {
             verifyIt = false;
-        } else if (a != "-" && a[0] == '-') {
+        } else if (a.rfind("--run=", 0) == 0 && a.size() > 6) {
+            runFunc = a.substr(6);
+        } else if (a != "-" && a[0] == '-' && (runFunc.empty() || !(std::isdigit(static_cast<unsigned char>(a[1])) || a[1] == '.'))) {
             return badUsage("unknown option '" + a + "'");
         } else {
-            if (haveInput) return badUsage("more than one input");
+            if (haveInput && !runFunc.empty()) runArgs.push_back(input);
+            else if (haveInput) return badUsage("more than one input");
             input = a;
             haveInput = true;
         }
@@ -99,6 +139,8 @@ int main(int argc, char** argv) {
         }
         if (failed) return 1;
     }
+
+    if (!runFunc.empty()) return runSubprog(unit, runFunc, runArgs);
 
     std::ofstream file;
     if (!output.empty()) {

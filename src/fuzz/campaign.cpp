@@ -1,0 +1,297 @@
+// Runs generated units through the interpreter and through gcc, and compares.
+#include "fuzz/campaign.h"
+
+#include <zoa/interp.h>
+#include <zoa/text.h>
+#include <zoa/verify.h>
+
+#include <cstdio>
+#include <fstream>
+#include <algorithm>
+#include <functional>
+#include <ostream>
+#include <sstream>
+#include <sys/stat.h>
+#include <sys/wait.h>
+
+namespace ZOA::fuzz {
+
+namespace {
+
+const char* cTypeName(DataType t) {
+    static const char* const n[] = {"unsigned char", "unsigned int", "uint64", "char", "int",
+                                    "int64", "float", "double", "char *", "void"};
+    return static_cast<unsigned>(t) < 10 ? n[t] : "void";
+}
+const char* printfFormat(DataType t) {
+    static const char* const f[] = {"%d", "%u", "%llu", "%d", "%d", "%lld", "%.9g", "%.17g", "ptr", "void"};
+    return static_cast<unsigned>(t) < 10 ? f[t] : "void";
+}
+
+struct Call {
+    std::string name;
+    DataType result;
+    std::vector<DataType> params;
+    std::vector<long long> args;
+    std::string line;  // what the interpreter says the program prints
+};
+
+// One unit, ready to be compiled: its C text and the calls that have a value.
+struct Prepared {
+    std::uint64_t seed = 0;
+    std::string prefix;
+    std::string text;
+    std::string c;
+    unsigned fileNames = 0;
+    std::vector<Call> calls;
+};
+
+interp::Value argValue(DataType t, long long v) {
+    return t == FLOAT || t == DOUBLE ? interp::Value::floating(t, static_cast<double>(v)) : interp::Value::integer(t, v);
+}
+
+// Interprets every entry; calls that stop are left out, and the machine is
+// rebuilt and replayed so that the static data matches a program that never made them.
+void interpret(ZOA_file& unit, const std::vector<Entry>& entries, Prepared& p, CampaignStats* stats) {
+    interp::Options o;
+    o.strictC = true;
+    o.maxSteps = 2000000;
+    auto machine = std::make_unique<interp::Machine>(unit, o);
+    for (const Entry& e : entries) {
+        for (std::size_t k = 0; k < e.argSets.size(); ++k) {
+            std::vector<interp::Value> args;
+            for (std::size_t i = 0; i < e.params.size(); ++i) args.push_back(argValue(e.params[i], e.argSets[k][i]));
+            interp::Result r = machine->call(e.name, args);
+            if (r.ok()) {
+                p.calls.push_back({e.name, e.result, e.params, e.argSets[k],
+                                   e.name + "#" + std::to_string(k) + " " + interp::format(r.value)});
+                continue;
+            }
+            if (stats) ++stats->dropped[std::string(interp::toString(r.status)) + ": " + r.message];
+            machine = std::make_unique<interp::Machine>(unit, o);
+            for (const Call& c : p.calls) {
+                std::vector<interp::Value> a;
+                for (std::size_t i = 0; i < c.params.size(); ++i) a.push_back(argValue(c.params[i], c.args[i]));
+                machine->call(c.name, a);
+            }
+        }
+    }
+}
+
+bool prepareUnit(ZOA_file& unit, const std::vector<Entry>& entries, Prepared& p, CampaignStats* stats,
+                 std::string* problem) {
+    for (const auto& d : verify::verify(unit))
+        if (d.severity == verify::Severity::ERROR) {
+            if (problem) *problem = verify::format(d);
+            return false;
+        }
+    p.fileNames = static_cast<unsigned>(unit.getNames().size());
+    interpret(unit, entries, p, stats);
+    std::ostringstream c;
+    unit.decompile(c);
+    p.c = c.str();
+    return true;
+}
+
+std::string argText(DataType t, long long v) {
+    char buf[64];
+    if (t == FLOAT || t == DOUBLE) std::snprintf(buf, sizeof buf, "(%s)%lld", cTypeName(t), v);
+    else std::snprintf(buf, sizeof buf, "(%s)0x%llxULL", cTypeName(t), static_cast<unsigned long long>(v));
+    return buf;
+}
+
+int shell(const std::string& cmd, std::string* output) {
+    std::string full = cmd + " 2>&1";
+    FILE* f = popen(full.c_str(), "r");
+    if (!f) return -1;
+    char buf[4096];
+    std::size_t n;
+    if (output) output->clear();
+    while ((n = fread(buf, 1, sizeof buf, f)) > 0)
+        if (output && output->size() < (1u << 22)) output->append(buf, n);
+    int st = pclose(f);
+    return WIFEXITED(st) ? WEXITSTATUS(st) : 128 + (WIFSIGNALED(st) ? WTERMSIG(st) : 0);
+}
+
+void writeText(const std::string& path, const std::string& text) {
+    std::ofstream(path, std::ios::binary) << text;
+}
+
+struct BuildResult {
+    bool built = false;
+    std::string detail;  // compiler message or first difference
+    bool same = false;
+};
+
+// Compiles the units with their driver at one level, runs and compares.
+BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std::string& dir,
+                            const std::string& level) {
+    std::string units_c, driver_c, expected;
+    units_c = "typedef long long int64;\ntypedef unsigned long long uint64;\n";
+    driver_c = "#include <stdio.h>\ntypedef long long int64;\ntypedef unsigned long long uint64;\n";
+    std::string body;
+    for (const Prepared* p : units) {
+        // File-level names are ng<id> in every unit: keep each unit's apart.
+        for (unsigned k = 0; k < p->fileNames; ++k)
+            units_c += "#define ng" + std::to_string(k) + " " + p->prefix + "ng" + std::to_string(k) + "\n";
+        units_c += p->c;
+        for (unsigned k = 0; k < p->fileNames; ++k) units_c += "#undef ng" + std::to_string(k) + "\n";
+        std::string declared;
+        for (const Call& c : p->calls) {
+            std::string proto = std::string(cTypeName(c.result)) + " " + c.name + "(";
+            for (std::size_t i = 0; i < c.params.size(); ++i) proto += (i ? ", " : "") + std::string(cTypeName(c.params[i]));
+            proto += ");\n";
+            if (declared.find(proto) == std::string::npos) declared += proto;
+            std::string call = c.name + "(";
+            for (std::size_t i = 0; i < c.params.size(); ++i) call += (i ? ", " : "") + argText(c.params[i], c.args[i]);
+            call += ")";
+            std::string label = c.line.substr(0, c.line.find(' ') + 1);
+            if (c.result == VOID)
+                body += "    " + call + "; puts(\"" + label + "void\");\n";
+            else
+                body += "    printf(\"" + label + printfFormat(c.result) + "\\n\", " +
+                        (c.result == CHAR_S || c.result == CHAR_U ? "(int)" : c.result == FLOAT ? "(double)" : "") +
+                        call + ");\n";
+            expected += c.line + "\n";
+        }
+        driver_c += declared;
+    }
+    driver_c += "int main(void)\n{\n" + body + "    return 0;\n}\n";
+    writeText(dir + "/units.c", units_c);
+    writeText(dir + "/driver.c", driver_c);
+    BuildResult r;
+    std::string out;
+    std::string prog = dir + "/prog" + level;
+    if (shell("gcc -m32 " + level + " -w -fno-strict-aliasing -o " + prog + " " + dir + "/units.c " + dir + "/driver.c", &out) != 0) {
+        r.detail = out.substr(0, 2000);
+        return r;
+    }
+    r.built = true;
+    // Where the kernel cannot run 32-bit programs, qemu-i386 runs them.
+    static const std::string runner =
+        shell("bash -c '" + prog + " >/dev/null'", nullptr) == 126 && shell("command -v qemu-i386", nullptr) == 0
+            ? "qemu-i386 " : "";
+    int st = shell("timeout 20 " + runner + prog, &out);
+    if (out == expected && st == 0) {
+        r.same = true;
+        return r;
+    }
+    std::istringstream a(out), b(expected);
+    std::string la, lb;
+    for (;;) {
+        bool ga = static_cast<bool>(std::getline(a, la)), gb = static_cast<bool>(std::getline(b, lb));
+        if (!ga && !gb) break;
+        if (!ga || !gb || la != lb) {
+            r.detail = "compiled (" + level + "): " + (ga ? la : "<nothing, exit " + std::to_string(st) + ">") +
+                       "\ninterpreted: " + (gb ? lb : "<nothing>");
+            break;
+        }
+    }
+    if (r.detail.empty()) r.detail = "exit status " + std::to_string(st);
+    return r;
+}
+
+// Re-checks one unit given as text, for the shrinker.
+bool textFails(const std::string& text, const std::vector<Entry>& entries, const std::string& prefix,
+               const std::string& dir, const std::vector<std::string>& levels, const std::string& kind) {
+    text::Result parsed = text::parse(text, "reduced.zoa");
+    if (!parsed.ok()) return false;
+    Prepared p;
+    p.prefix = prefix;
+    if (!prepareUnit(*parsed.unit(), entries, p, nullptr, nullptr) || p.calls.empty()) return false;
+    for (const std::string& level : levels) {
+        BuildResult r = buildAndCompare({&p}, dir, level);
+        if (kind == "build" ? !r.built : (r.built && !r.same)) return true;
+    }
+    return false;
+}
+
+}  // namespace
+
+CampaignStats runDifferential(const CampaignOptions& o) {
+    CampaignStats stats;
+    mkdir(o.workDir.c_str(), 0755);
+    std::vector<Prepared> batch;
+    std::vector<std::vector<Entry>> batchEntries;
+    unsigned shrunk = 0;
+
+    auto flush = [&]() {
+        if (batch.empty()) return;
+        std::vector<const Prepared*> all;
+        for (const Prepared& p : batch) all.push_back(&p);
+        bool allSame = true;
+        for (const std::string& level : o.optLevels) {
+            BuildResult r = buildAndCompare(all, o.workDir, level);
+            ++stats.programsBuilt;
+            allSame = allSame && r.same;
+        }
+        if (!allSame) {  // isolate the failing units
+            for (std::size_t i = 0; i < batch.size(); ++i) {
+                for (const std::string& level : o.optLevels) {
+                    BuildResult r = buildAndCompare({&batch[i]}, o.workDir, level);
+                    if (r.same) continue;
+                    Failure f{batch[i].seed, r.built ? "mismatch" : "build", r.detail, batch[i].text, ""};
+                    std::string base = o.workDir + "/seed-" + std::to_string(f.seed);
+                    writeText(base + ".zoa", f.text);
+                    if (o.log) *o.log << "seed " << f.seed << ": " << f.kind << "\n" << f.detail << "\n  unit: " << base << ".zoa\n";
+                    if (shrunk < o.shrinkLimit) {
+                        ++shrunk;
+                        std::vector<Entry> entries = batchEntries[i];
+                        std::string prefix = batch[i].prefix, kind = f.kind;
+                        f.reduced = shrink(f.text, [&](const std::string& t) {
+                            return textFails(t, entries, prefix, o.workDir, o.optLevels, kind);
+                        }, 800);
+                        writeText(base + ".min.zoa", f.reduced);
+                        if (o.log) *o.log << "  reduced: " << base << ".min.zoa\n";
+                    }
+                    stats.failures.push_back(f);
+                    break;
+                }
+            }
+        }
+        for (const Prepared& p : batch) stats.callsCompared += static_cast<unsigned>(p.calls.size());
+        batch.clear();
+        batchEntries.clear();
+    };
+
+    for (unsigned i = 0; i < o.seeds; ++i) {
+        std::uint64_t seed = o.firstSeed + i;
+        Prepared p;
+        p.seed = seed;
+        p.prefix = "u" + std::to_string(seed) + "_";
+        Generated g = generate(seed, o.mode, p.prefix);
+        p.text = text::write(*g.unit);
+        stats.seeds++;
+        stats.subprogs += static_cast<unsigned>(g.entries.size());
+        std::string problem;
+        if (!prepareUnit(*g.unit, g.entries, p, &stats, &problem)) {
+            stats.failures.push_back({seed, "invalid unit", problem, p.text, ""});
+            if (o.log) *o.log << "seed " << seed << ": the generator made an invalid unit: " << problem << "\n";
+            continue;
+        }
+        batch.push_back(std::move(p));
+        batchEntries.push_back(g.entries);
+        if (batch.size() >= o.batch) flush();
+        if (o.log && (i + 1) % 200 == 0) *o.log << (i + 1) << " seeds, " << stats.failures.size() << " failures\n" << std::flush;
+    }
+    flush();
+    return stats;
+}
+
+void report(std::ostream& os, const CampaignOptions& o, const CampaignStats& s) {
+    unsigned dropped = 0;
+    for (const auto& [why, n] : s.dropped) dropped += n;
+    os << "seeds " << o.firstSeed << ".." << (o.firstSeed + o.seeds - 1) << ": " << s.seeds << " units, "
+       << s.subprogs << " subprograms, " << s.callsCompared << " calls compared at each of";
+    for (const std::string& l : o.optLevels) os << ' ' << l;
+    os << ", " << dropped << " calls without a C meaning left out, " << s.programsBuilt << " programs built, "
+       << s.failures.size() << " failures\n";
+    std::vector<std::pair<unsigned, std::string>> reasons;
+    for (const auto& [why, n] : s.dropped) reasons.push_back({n, why});
+    std::sort(reasons.rbegin(), reasons.rend());
+    for (std::size_t i = 0; i < reasons.size() && i < 8; ++i)
+        os << "  left out " << reasons[i].first << "x: " << reasons[i].second << "\n";
+    for (const Failure& f : s.failures) os << "  seed " << f.seed << ": " << f.kind << ": " << f.detail << "\n";
+}
+
+}  // namespace ZOA::fuzz

@@ -1,0 +1,41 @@
+// Random units for differential and crash testing, built through the public API.
+#ifndef ZOA_FUZZ_GEN_H
+#define ZOA_FUZZ_GEN_H
+
+#include <zoa/zoa.h>
+
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace ZOA::fuzz {
+
+enum class Mode {
+    C,    // every operator and type where the C text has a defined meaning
+    ASM,  // what the assembly output translates: PLUS, MINUS, MUL, relations,
+          // CONV4, INT_S/INT_U/CHAR types, buffers and tables, calls, jumps
+    ODD,  // odd but constructible trees: shared subtrees, empty labels,
+          // statements after jumps, null SEQ sides, unused temps, deep nesting
+};
+
+// A subprogram the driver calls, with the argument sets to call it on.
+struct Entry {
+    std::string name;
+    DataType result = VOID;
+    std::vector<DataType> params;
+    std::vector<std::vector<long long>> argSets;  // FLOAT/DOUBLE params get integer values
+};
+
+struct Generated {
+    std::unique_ptr<ZOA_file> unit;  // valid until the next unit is constructed
+    std::vector<Entry> entries;
+};
+
+// Builds the unit for `seed`; subprogram names start with `prefix`. The same
+// seed, mode and prefix always give the same unit.
+Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix);
+
+}  // namespace ZOA::fuzz
+
+#endif
