@@ -23,7 +23,7 @@ unsigned int roundUp(unsigned int v, unsigned int to) { return (v + to - 1) / to
 
 }  // namespace
 
-DecompileASM::DecompileASM(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc) {
+DecompileASM::DecompileASM(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc), sink(os) {
     for (ExprBase*& h : regHolders) h = nullptr;
     for (bool& f : regInUse) f = false;
 }
@@ -44,7 +44,7 @@ void DecompileASM::visit(SUBPROG* sp) {
     line() << ".text";
     endLine();
     if (!sp->isStatic()) {
-        out << ".globl " << sp->getName();
+        sink << ".globl " << sp->getName();
         endLine();
     }
     line() << ".type " << sp->getName() << ",@function";
@@ -90,9 +90,10 @@ void DecompileASM::visit(SUBPROG* sp) {
     line() << "mov DWORD PTR ebp, DWORD PTR esp";
     endLine();
     unsigned int frame = roundUp(roundUp(s, 4) + maxOutgoingArgBytes, 8);
-    line() << "sub esp, " << frame;
+    line() << "sub esp, ";
+    putUnsigned(frame);
     endLine();
-    line() << "mov DWORD PTR -" << 4 << "[ebp], DWORD PTR ebx";
+    line() << "mov DWORD PTR -4[ebp], DWORD PTR ebx";
     endLine();
 
     buildTraces();
@@ -114,7 +115,7 @@ void DecompileASM::writeEpilogue() {
         putOperand(result, true);
         endLine();
     }
-    line() << "mov DWORD PTR ebx, DWORD PTR -" << 4 << "[ebp]";
+    line() << "mov DWORD PTR ebx, DWORD PTR -4[ebp]";
     endLine();
     line() << "leave";
     endLine();
@@ -139,8 +140,13 @@ void DecompileASM::writeAlloca(CALL* c) {
         line() << "sub esp, " << registerName(r);
         endLine();
     }
-    if (maxOutgoingArgBytes != 0) line() << "lea eax, [esp+" << maxOutgoingArgBytes << ']';
-    else line() << "mov eax, esp";
+    if (maxOutgoingArgBytes != 0) {
+        line() << "lea eax, [esp+";
+        putUnsigned(maxOutgoingArgBytes);
+        put("]");
+    } else {
+        line() << "mov eax, esp";
+    }
     endLine();
     claimRegister(EAX);
     assignRegister(c, EAX, false);
@@ -178,7 +184,9 @@ void DecompileASM::visit(CALL* c) {
         bool isConstant = a->getNodeType() == CONST_NODE;
         if (isWideArgument(a)) {
             if (isConstant) {
-                line() << "mov DWORD PTR [esp+" << off << "], 0";
+                line() << "mov DWORD PTR [esp+";
+                putInt(off);
+                put("], 0");
                 endLine();
             } else {
                 if (a->getNodeType() == MEM_NODE) {
@@ -186,7 +194,9 @@ void DecompileASM::visit(CALL* c) {
                     line() << "mov DWORD PTR eax, DWORD PTR [" << registerName(ma ? ma->reg : NO_REGISTER) << "+4]";
                     endLine();
                 }
-                line() << "mov DWORD PTR [esp+" << off << "], eax";
+                line() << "mov DWORD PTR [esp+";
+                putInt(off);
+                put("], eax");
                 endLine();
             }
             off -= 4;
@@ -203,8 +213,11 @@ void DecompileASM::visit(CALL* c) {
             freeRegister(aa ? aa->reg : NO_REGISTER);
         }
         line() << "mov DWORD PTR [esp";
-        if (off != 0) out << '+' << off;
-        out << "], eax";
+        if (off != 0) {
+            put("+");
+            putInt(off);
+        }
+        put("], eax");
         endLine();
         off -= 4;
     }

@@ -3,6 +3,7 @@
 #define ZOA_EMIT_X86_DECOMPILE_ASM_H
 
 #include "emit/decompile_base.h"
+#include "emit/text_out.h"
 #include "emit/used_nodes.h"
 
 #include <zoa/expr.h>
@@ -152,10 +153,19 @@ private:
     OperandParts operandParts(ExprBase* e, bool useRegister, bool byteForm);
     void evict(ExprBase* holder);
 
-    // Line writing: the line's indentation, tokens, the end of the line.
-    std::ostream& line() { return indent(indentLevel); }
-    void endLine() { out << std::endl; }
-    void put(const char* s);
+    // Line writing: the line's indentation, tokens, the end of the line. A
+    // line is gathered in the sink and handed to the stream whole at its end,
+    // followed by a flush of the stream, as std::endl would: whoever reads the
+    // stream sees every line as soon as it is complete.
+    TextOut& line() { return sink.indent(indentLevel); }
+    void endLine() {
+        sink << '\n';
+        sink.flush();
+        out.flush();
+    }
+    void put(const char* s) { sink << s; }
+    void putUnsigned(unsigned long long v) { sink.writeUnsigned(v); }
+    void putInt(long long v) { sink.writeInt(v); }
     void putReg(AsmRegister r, bool bracketed = false) { put(registerName(r, bracketed)); }
     void putOperand(ExprBase* e, bool useRegister);
     void putByteOperand(ExprBase* e);
@@ -177,6 +187,8 @@ private:
     void moveOther(ExprBase* d, ExprBase* s);
 
     UsedMap used;  // reused across subprograms
+    TextOut sink;
+    TextOut::Batch lines{sink};  // the sink gathers until endLine for the emitter's lifetime
 };
 
 }  // namespace ZOA

@@ -59,7 +59,9 @@ void DecompileASM::visit(BUF_TEMP* b) {
     putReg(x);
     put(", ");
     put(sizePrefix(b));
-    out << 't' << b->getId() << "[ebp]";
+    put("t");
+    putUnsigned(b->getId());
+    put("[ebp]");
     endLine();
     assignRegister(b, x, false);
 }
