@@ -131,13 +131,13 @@ void DecompileASM::writeAlloca(CALL* c) {
     if (size) {
         size->accept(this);
         AsmRegister r = loadIntoRegister(size, false);
-        line() << "add " << registerName(r) << ", 15 # alloca";
+        line() << "add " << registerText(r) << ", 15 # alloca";
         endLine();
-        line() << "shr " << registerName(r) << ", 4";
+        line() << "shr " << registerText(r) << ", 4";
         endLine();
-        line() << "sal " << registerName(r) << ", 4";
+        line() << "sal " << registerText(r) << ", 4";
         endLine();
-        line() << "sub esp, " << registerName(r);
+        line() << "sub esp, " << registerText(r);
         endLine();
     }
     if (maxOutgoingArgBytes != 0) {
@@ -191,7 +191,7 @@ void DecompileASM::visit(CALL* c) {
             } else {
                 if (a->getNodeType() == MEM_NODE) {
                     ExprAnnotation* ma = annotationOf(a);
-                    line() << "mov DWORD PTR eax, DWORD PTR [" << registerName(ma ? ma->reg : NO_REGISTER) << "+4]";
+                    line() << "mov DWORD PTR eax, DWORD PTR [" << registerText(ma ? ma->reg : NO_REGISTER) << "+4]";
                     endLine();
                 }
                 line() << "mov DWORD PTR [esp+";
@@ -227,7 +227,7 @@ void DecompileASM::visit(CALL* c) {
         line() << "call " << name;
     } else {
         AsmRegister r = loadIntoRegister(pointer, false);
-        line() << "call " << registerName(r);
+        line() << "call " << registerText(r);
     }
     endLine();
     claimRegister(EAX);

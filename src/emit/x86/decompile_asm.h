@@ -10,7 +10,9 @@
 #include <zoa/memmgr.h>
 
 #include <cstddef>
+#include <cstdint>
 #include <string>
+#include <string_view>
 
 namespace ZOA {
 
@@ -102,6 +104,7 @@ public:
 
     // --- register model (registers.cpp)
     static const char* registerName(AsmRegister reg, bool bracketed = false);
+    static std::string_view registerText(AsmRegister reg, bool bracketed = false);
     static AsmRegister registerOfClass(AsmRegister reg, RegClass cls);
     static bool isRegisterOfClass(AsmRegister reg, RegClass cls);
     void markRegister(AsmRegister reg, bool flag);
@@ -142,16 +145,23 @@ public:
 protected:
     unsigned int maxOutgoingArgBytes = 0;
     ExprBase* regHolders[HOLDER_SLOTS];
+    std::uint32_t heldSlots = 0;  // bit i set while regHolders[i] is not null
     bool regInUse[64];
 
 private:
     struct OperandParts {
-        const char* prefix;
-        const char* text;
-        std::size_t length;
+        std::string_view prefix;  // size keyword
+        std::string_view text;    // register, memory or immediate text
     };
+    static std::string_view sizePrefixText(ExprBase* e);
     OperandParts operandParts(ExprBase* e, bool useRegister, bool byteForm);
     void evict(ExprBase* holder);
+    // Empties slot i of the holders after evicting its expression.
+    void dropHolder(unsigned int i) {
+        evict(regHolders[i]);
+        regHolders[i] = nullptr;
+        heldSlots &= ~(std::uint32_t{1} << i);
+    }
 
     // Line writing: the line's indentation, tokens, the end of the line. A
     // line is gathered in the sink and handed to the stream whole at its end,
@@ -166,7 +176,7 @@ private:
     void put(const char* s) { sink << s; }
     void putUnsigned(unsigned long long v) { sink.writeUnsigned(v); }
     void putInt(long long v) { sink.writeInt(v); }
-    void putReg(AsmRegister r, bool bracketed = false) { put(registerName(r, bracketed)); }
+    void putReg(AsmRegister r, bool bracketed = false) { sink << registerText(r, bracketed); }
     void putOperand(ExprBase* e, bool useRegister);
     void putByteOperand(ExprBase* e);
     void putAddress(MEM* mem);  // "[A op B]"

@@ -58,7 +58,7 @@ void DecompileASM::visit(BUF_TEMP* b) {
     line() << "lea ";
     putReg(x);
     put(", ");
-    put(sizePrefix(b));
+    sink << sizePrefixText(b);
     put("t");
     putUnsigned(b->getId());
     put("[ebp]");

@@ -15,7 +15,7 @@ namespace {
 
 struct TypeInfo {
     unsigned int size;       // bytes of a value
-    const char* prefix;      // size keyword of a memory operand
+    std::string_view prefix; // size keyword of a memory operand
     const char* directive;   // data directive of one element
     bool isSigned;
 };
@@ -92,7 +92,10 @@ unsigned int DecompileASM::valueSize(ExprBase* e) {
     return infoOf(e->getDataType()).size;
 }
 
-const char* DecompileASM::sizePrefix(ExprBase* e) { return e ? infoOf(e->getDataType()).prefix : ""; }
+std::string_view DecompileASM::sizePrefixText(ExprBase* e) { return e ? infoOf(e->getDataType()).prefix : ""; }
+
+// The table's texts are literals, so the view's data is terminated.
+const char* DecompileASM::sizePrefix(ExprBase* e) { return sizePrefixText(e).data(); }
 
 const char* DecompileASM::dataDirective(DataType t) { return infoOf(t).directive; }
 
@@ -113,20 +116,18 @@ DecompileASM::ExprAnnotation* DecompileASM::ensureAnnotation(ExprBase* e) {
 }
 
 DecompileASM::OperandParts DecompileASM::operandParts(ExprBase* e, bool useRegister, bool byteForm) {
-    OperandParts p{"", "", 0};
+    OperandParts p{"", ""};
     if (!e) return p;
     NodeType kind = e->getNodeType();
     ExprAnnotation* a = kind == NAME_NODE ? ensureAnnotation(e) : annotationOf(e);
-    if (kind != CONST_NODE) p.prefix = byteForm ? "BYTE PTR " : sizePrefix(e);
+    if (kind != CONST_NODE) p.prefix = byteForm ? "BYTE PTR " : sizePrefixText(e);
     if (!a) return p;
     if (a->reg == NO_REGISTER || !useRegister) {
         if (kind == NAME_NODE) p.prefix = "";
-        p.text = a->memText.data();
-        p.length = a->memText.size();
+        p.text = {a->memText.data(), a->memText.size()};
     } else {
         AsmRegister r = byteForm ? registerOfClass(a->reg, LOW_BYTE) : a->reg;
-        p.text = registerName(r, a->isIndirect);
-        p.length = std::strlen(p.text);
+        p.text = registerText(r, a->isIndirect);
     }
     return p;
 }
@@ -134,27 +135,25 @@ DecompileASM::OperandParts DecompileASM::operandParts(ExprBase* e, bool useRegis
 std::string DecompileASM::operandText(ExprBase* e, bool useRegister) {
     OperandParts p = operandParts(e, useRegister, false);
     std::string s(p.prefix);
-    s.append(p.text, p.length);
+    s.append(p.text);
     return s;
 }
 
 std::string DecompileASM::byteOperandText(ExprBase* e) {
     OperandParts p = operandParts(e, true, true);
     std::string s(p.prefix);
-    s.append(p.text, p.length);
+    s.append(p.text);
     return s;
 }
 
 void DecompileASM::putOperand(ExprBase* e, bool useRegister) {
     OperandParts p = operandParts(e, useRegister, false);
-    put(p.prefix);
-    sink.write(p.text, p.length);
+    sink << p.prefix << p.text;
 }
 
 void DecompileASM::putByteOperand(ExprBase* e) {
     OperandParts p = operandParts(e, true, true);
-    put(p.prefix);
-    sink.write(p.text, p.length);
+    sink << p.prefix << p.text;
 }
 
 void DecompileASM::putLabel(LABEL* l) {
