@@ -52,8 +52,7 @@ void DecompileASM::visit(SUBPROG* sp) {
     line() << sp->getName() << ':';
     endLine();
 
-    used.clear();
-    UsedNodes collect(sp, &used);
+    used.collect(sp);
     ++indentLevel;
 
     unsigned int s = 4;
@@ -65,17 +64,15 @@ void DecompileASM::visit(SUBPROG* sp) {
         writeTempSymbol(arg);
     }
 
-    used.forEach([this](TreeBase* node, NodeType type) {
-        if (type != CALL_NODE) return;
+    for (CALL* c : used.calls()) {
         unsigned int bytes = 0;
-        for (ExprBase* a : static_cast<CALL*>(node)->getArgs()) bytes += argumentBytes(a);
+        for (ExprBase* a : c->getArgs()) bytes += argumentBytes(a);
         if (bytes > maxOutgoingArgBytes) maxOutgoingArgBytes = bytes;
-    });
+    }
 
     s = 4;
     for (TEMP* t : sp->getAllTemps()) {
-        const NodeType* recorded = t ? used.find(t) : nullptr;
-        if (!recorded || *recorded != TEMP_NODE || t->getType() == ARGUMENT_TEMP) continue;
+        if (!used.isUsed(t) || t->getType() == ARGUMENT_TEMP) continue;
         unsigned int z = valueSize(t);
         s += z;
         if (z >= 5) s = roundUp(s, 8);

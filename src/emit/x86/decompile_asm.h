@@ -4,7 +4,7 @@
 
 #include "emit/decompile_base.h"
 #include "emit/text_out.h"
-#include "emit/used_nodes.h"
+#include "emit/used_temps.h"
 
 #include <zoa/expr.h>
 #include <zoa/memmgr.h>
@@ -196,7 +196,7 @@ private:
     void moveTempFromBinop(ExprBase* d, ExprBase* s);
     void moveOther(ExprBase* d, ExprBase* s);
 
-    UsedMap used;  // reused across subprograms
+    UsedTemps used;  // reused across subprograms
     TextOut sink;
     TextOut::Batch lines{sink};  // the sink gathers until endLine for the emitter's lifetime
 };
