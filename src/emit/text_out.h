@@ -60,8 +60,16 @@ public:
         else write(&c, 1);
         return *this;
     }
-    // n levels of four blanks.
-    TextOut& indent(unsigned int n) { return n == 0 ? *this : writeBlanks(n); }
+    // n levels of four blanks; the usual shallow levels inline.
+    TextOut& indent(unsigned int n) {
+        if (n == 0) return *this;
+        if (n <= MAX_INLINE_INDENT && depth != 0 && CAPACITY - used >= 4 * n) {
+            copyShort(buf.get() + used, BLANKS, 4 * n);
+            used += 4 * n;
+            return *this;
+        }
+        return writeBlanks(n);
+    }
     // Plain decimal.
     TextOut& writeUnsigned(unsigned long long v) {
         if (v < 100 && depth != 0 && CAPACITY - used >= 2) {
@@ -87,6 +95,8 @@ private:
     TextOut& writeDecimal(unsigned long long v);
 
     static constexpr std::size_t CAPACITY = 1 << 15;
+    static constexpr unsigned int MAX_INLINE_INDENT = 4;
+    static constexpr char BLANKS[4 * MAX_INLINE_INDENT + 1] = "                ";
     std::ostream& os;
     std::size_t used = 0;
     unsigned int depth = 0;

@@ -5,7 +5,7 @@ namespace ZOA::ctext {
 
 namespace {
 
-const char* const typeNames[DATA_TYPE_COUNT] = {
+const std::string_view typeNames[DATA_TYPE_COUNT] = {
     "unsigned char ",  // CHAR_U
     "unsigned int ",   // INT_U
     "uint64 ",         // INT64_U
@@ -18,12 +18,12 @@ const char* const typeNames[DATA_TYPE_COUNT] = {
     "void ",           // VOID
 };
 
-const char* const binopTexts[MAX_BINOP] = {
+const std::string_view binopTexts[MAX_BINOP] = {
     "+", "-", "*", "/", "%", "&&", "||", "==", "!=", "<", "<=", ">", ">=", "<<", ">>", "&", "|", "^",
 };
 
 // ABS is written apart; kinds without a cast print the bare operand.
-const char* const unopTexts[UNOP_KIND_COUNT] = {
+const std::string_view unopTexts[UNOP_KIND_COUNT] = {
     "",                 // ABS
     "-",                // NEG
     "!",                // NOT
@@ -51,17 +51,17 @@ const char* const unopTexts[UNOP_KIND_COUNT] = {
 
 }  // namespace
 
-const char* typeName(DataType t) {
+std::string_view typeName(DataType t) {
     unsigned int i = static_cast<unsigned int>(t);
     return i < DATA_TYPE_COUNT ? typeNames[i] : "";
 }
 
-const char* binopText(BinopKind op) {
+std::string_view binopText(BinopKind op) {
     unsigned int i = static_cast<unsigned int>(op);
     return i < MAX_BINOP ? binopTexts[i] : "";
 }
 
-const char* unopText(UnopKind op) {
+std::string_view unopText(UnopKind op) {
     unsigned int i = static_cast<unsigned int>(op);
     return i < UNOP_KIND_COUNT ? unopTexts[i] : "";
 }

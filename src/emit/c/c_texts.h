@@ -4,12 +4,15 @@
 
 #include <zoa/enums.h>
 
+#include <string_view>
+
 namespace ZOA::ctext {
 
-// The text for the value, or "" for a value the table does not cover.
-const char* typeName(DataType t);
-const char* binopText(BinopKind op);
-const char* unopText(UnopKind op);
+// The text for the value, or "" for a value the table does not cover. Views,
+// so that writing one needs no strlen.
+std::string_view typeName(DataType t);
+std::string_view binopText(BinopKind op);
+std::string_view unopText(UnopKind op);
 
 }  // namespace ZOA::ctext
 

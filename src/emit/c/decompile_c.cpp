@@ -49,17 +49,40 @@ void DecompileC::printFlat(ExprBase* e) {
     if (!e) return;
     unsigned int saved = indentLevel;
     indentLevel = 0;
-    e->accept(this);
+    printExpr(e, e->getNodeType());
     indentLevel = saved;
 }
 
+// Statements print their expressions through here: one type query, then a
+// direct call of the printer, where accept would cost two virtual calls.
+void DecompileC::printExpr(ExprBase* e, NodeType t) {
+    switch (t) {
+    case TEMP_NODE:
+    case BUF_TEMP_NODE:
+        sink << 't';
+        writeUnsigned(static_cast<TEMP*>(e)->getId());
+        return;
+    case CONST_NODE: DecompileC::visit(static_cast<CONST*>(e)); return;
+    case BINOP_NODE: DecompileC::visit(static_cast<BINOP*>(e)); return;
+    case MEM_NODE: DecompileC::visit(static_cast<MEM*>(e)); return;
+    case UNOP_NODE: DecompileC::visit(static_cast<UNOP*>(e)); return;
+    case NAME_NODE: DecompileC::visit(static_cast<NAME*>(e)); return;
+    case CALL_NODE: DecompileC::visit(static_cast<CALL*>(e)); return;
+    default: e->accept(this); return;
+    }
+}
+
+// Operands print with no indentation.
 void DecompileC::writeOperand(ExprBase* e) {
     if (!e) return;
+    unsigned int saved = indentLevel;
+    indentLevel = 0;
     NodeType t = e->getNodeType();
     bool bare = t == TEMP_NODE || t == BUF_TEMP_NODE || t == CONST_NODE;
     if (!bare) sink << '(';
-    printFlat(e);
+    printExpr(e, t);
     if (!bare) sink << ')';
+    indentLevel = saved;
 }
 
 void DecompileC::writeDataPrefix(NAME* n) {

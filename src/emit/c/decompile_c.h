@@ -4,7 +4,7 @@
 
 #include "emit/decompile_base.h"
 #include "emit/text_out.h"
-#include "emit/used_nodes.h"
+#include "emit/used_temps.h"
 
 #include <zoa/enums.h>
 
@@ -78,6 +78,8 @@ public:
 private:
     // Prints e with indentLevel 0, restoring the level afterwards.
     void printFlat(ExprBase* e);
+    // Prints e, of node type t, at the current indentation (0 inside printFlat).
+    void printExpr(ExprBase* e, NodeType t);
     // Prints a statement or label, keeping indentLevel as it was.
     void printStmt(StmtBase* s);
     void printLabel(LABEL* l);
@@ -91,7 +93,7 @@ private:
     // Indentation into sink (the base's indent writes to the stream directly).
     TextOut& pad(unsigned int n) { return sink.indent(n); }
 
-    UsedMap usedMap;  // reused across subprograms
+    UsedTemps usedTemps;  // reused across subprograms
     TextOut sink;     // everything this emitter writes goes through it
 };
 

@@ -186,8 +186,7 @@ void DecompileC::visit(SUBPROG* sp) {
     writeTypeName(sp->getReturnType());
     sink << sp->getName() << '(';
 
-    usedMap.clear();
-    UsedNodes used(sp, &usedMap);
+    usedTemps.collect(sp);
 
     bool first = true;
     for (TEMP* t : sp->getAllArgTemps()) {
@@ -202,9 +201,7 @@ void DecompileC::visit(SUBPROG* sp) {
     for (int pass = 0; pass < 2; ++pass) {
         bool buffers = pass == 0;
         for (TEMP* t : sp->getAllTemps()) {
-            if (!t || t->getType() == ARGUMENT_TEMP) continue;
-            const NodeType* v = usedMap.find(t);
-            if (!v || *v != TEMP_NODE) continue;
+            if (!t || t->getType() == ARGUMENT_TEMP || !usedTemps.isUsed(t)) continue;
             if ((t->getNodeType() == BUF_TEMP_NODE) == buffers) declareTemp(t);
         }
     }

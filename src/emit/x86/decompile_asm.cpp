@@ -23,7 +23,7 @@ unsigned int roundUp(unsigned int v, unsigned int to) { return (v + to - 1) / to
 
 }  // namespace
 
-DecompileASM::DecompileASM(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc) {
+DecompileASM::DecompileASM(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc), sink(os) {
     for (ExprBase*& h : regHolders) h = nullptr;
     for (bool& f : regInUse) f = false;
 }
@@ -44,7 +44,7 @@ void DecompileASM::visit(SUBPROG* sp) {
     line() << ".text";
     endLine();
     if (!sp->isStatic()) {
-        out << ".globl " << sp->getName();
+        sink << ".globl " << sp->getName();
         endLine();
     }
     line() << ".type " << sp->getName() << ",@function";
@@ -52,8 +52,7 @@ void DecompileASM::visit(SUBPROG* sp) {
     line() << sp->getName() << ':';
     endLine();
 
-    used.clear();
-    UsedNodes collect(sp, &used);
+    used.collect(sp);
     ++indentLevel;
 
     unsigned int s = 4;
@@ -65,17 +64,15 @@ void DecompileASM::visit(SUBPROG* sp) {
         writeTempSymbol(arg);
     }
 
-    used.forEach([this](TreeBase* node, NodeType type) {
-        if (type != CALL_NODE) return;
+    for (CALL* c : used.calls()) {
         unsigned int bytes = 0;
-        for (ExprBase* a : static_cast<CALL*>(node)->getArgs()) bytes += argumentBytes(a);
+        for (ExprBase* a : c->getArgs()) bytes += argumentBytes(a);
         if (bytes > maxOutgoingArgBytes) maxOutgoingArgBytes = bytes;
-    });
+    }
 
     s = 4;
     for (TEMP* t : sp->getAllTemps()) {
-        const NodeType* recorded = t ? used.find(t) : nullptr;
-        if (!recorded || *recorded != TEMP_NODE || t->getType() == ARGUMENT_TEMP) continue;
+        if (!used.isUsed(t) || t->getType() == ARGUMENT_TEMP) continue;
         unsigned int z = valueSize(t);
         s += z;
         if (z >= 5) s = roundUp(s, 8);
@@ -90,9 +87,10 @@ void DecompileASM::visit(SUBPROG* sp) {
     line() << "mov DWORD PTR ebp, DWORD PTR esp";
     endLine();
     unsigned int frame = roundUp(roundUp(s, 4) + maxOutgoingArgBytes, 8);
-    line() << "sub esp, " << frame;
+    line() << "sub esp, ";
+    putUnsigned(frame);
     endLine();
-    line() << "mov DWORD PTR -" << 4 << "[ebp], DWORD PTR ebx";
+    line() << "mov DWORD PTR -4[ebp], DWORD PTR ebx";
     endLine();
 
     buildTraces();
@@ -114,7 +112,7 @@ void DecompileASM::writeEpilogue() {
         putOperand(result, true);
         endLine();
     }
-    line() << "mov DWORD PTR ebx, DWORD PTR -" << 4 << "[ebp]";
+    line() << "mov DWORD PTR ebx, DWORD PTR -4[ebp]";
     endLine();
     line() << "leave";
     endLine();
@@ -130,17 +128,22 @@ void DecompileASM::writeAlloca(CALL* c) {
     if (size) {
         size->accept(this);
         AsmRegister r = loadIntoRegister(size, false);
-        line() << "add " << registerName(r) << ", 15 # alloca";
+        line() << "add " << registerText(r) << ", 15 # alloca";
         endLine();
-        line() << "shr " << registerName(r) << ", 4";
+        line() << "shr " << registerText(r) << ", 4";
         endLine();
-        line() << "sal " << registerName(r) << ", 4";
+        line() << "sal " << registerText(r) << ", 4";
         endLine();
-        line() << "sub esp, " << registerName(r);
+        line() << "sub esp, " << registerText(r);
         endLine();
     }
-    if (maxOutgoingArgBytes != 0) line() << "lea eax, [esp+" << maxOutgoingArgBytes << ']';
-    else line() << "mov eax, esp";
+    if (maxOutgoingArgBytes != 0) {
+        line() << "lea eax, [esp+";
+        putUnsigned(maxOutgoingArgBytes);
+        put("]");
+    } else {
+        line() << "mov eax, esp";
+    }
     endLine();
     claimRegister(EAX);
     assignRegister(c, EAX, false);
@@ -178,15 +181,19 @@ void DecompileASM::visit(CALL* c) {
         bool isConstant = a->getNodeType() == CONST_NODE;
         if (isWideArgument(a)) {
             if (isConstant) {
-                line() << "mov DWORD PTR [esp+" << off << "], 0";
+                line() << "mov DWORD PTR [esp+";
+                putInt(off);
+                put("], 0");
                 endLine();
             } else {
                 if (a->getNodeType() == MEM_NODE) {
                     ExprAnnotation* ma = annotationOf(a);
-                    line() << "mov DWORD PTR eax, DWORD PTR [" << registerName(ma ? ma->reg : NO_REGISTER) << "+4]";
+                    line() << "mov DWORD PTR eax, DWORD PTR [" << registerText(ma ? ma->reg : NO_REGISTER) << "+4]";
                     endLine();
                 }
-                line() << "mov DWORD PTR [esp+" << off << "], eax";
+                line() << "mov DWORD PTR [esp+";
+                putInt(off);
+                put("], eax");
                 endLine();
             }
             off -= 4;
@@ -203,8 +210,11 @@ void DecompileASM::visit(CALL* c) {
             freeRegister(aa ? aa->reg : NO_REGISTER);
         }
         line() << "mov DWORD PTR [esp";
-        if (off != 0) out << '+' << off;
-        out << "], eax";
+        if (off != 0) {
+            put("+");
+            putInt(off);
+        }
+        put("], eax");
         endLine();
         off -= 4;
     }
@@ -214,7 +224,7 @@ void DecompileASM::visit(CALL* c) {
         line() << "call " << name;
     } else {
         AsmRegister r = loadIntoRegister(pointer, false);
-        line() << "call " << registerName(r);
+        line() << "call " << registerText(r);
     }
     endLine();
     claimRegister(EAX);

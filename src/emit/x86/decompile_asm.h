@@ -3,13 +3,16 @@
 #define ZOA_EMIT_X86_DECOMPILE_ASM_H
 
 #include "emit/decompile_base.h"
-#include "emit/used_nodes.h"
+#include "emit/text_out.h"
+#include "emit/used_temps.h"
 
 #include <zoa/expr.h>
 #include <zoa/memmgr.h>
 
 #include <cstddef>
+#include <cstdint>
 #include <string>
+#include <string_view>
 
 namespace ZOA {
 
@@ -101,6 +104,7 @@ public:
 
     // --- register model (registers.cpp)
     static const char* registerName(AsmRegister reg, bool bracketed = false);
+    static std::string_view registerText(AsmRegister reg, bool bracketed = false);
     static AsmRegister registerOfClass(AsmRegister reg, RegClass cls);
     static bool isRegisterOfClass(AsmRegister reg, RegClass cls);
     void markRegister(AsmRegister reg, bool flag);
@@ -141,22 +145,38 @@ public:
 protected:
     unsigned int maxOutgoingArgBytes = 0;
     ExprBase* regHolders[HOLDER_SLOTS];
+    std::uint32_t heldSlots = 0;  // bit i set while regHolders[i] is not null
     bool regInUse[64];
 
 private:
     struct OperandParts {
-        const char* prefix;
-        const char* text;
-        std::size_t length;
+        std::string_view prefix;  // size keyword
+        std::string_view text;    // register, memory or immediate text
     };
+    static std::string_view sizePrefixText(ExprBase* e);
     OperandParts operandParts(ExprBase* e, bool useRegister, bool byteForm);
     void evict(ExprBase* holder);
+    // Empties slot i of the holders after evicting its expression.
+    void dropHolder(unsigned int i) {
+        evict(regHolders[i]);
+        regHolders[i] = nullptr;
+        heldSlots &= ~(std::uint32_t{1} << i);
+    }
 
-    // Line writing: the line's indentation, tokens, the end of the line.
-    std::ostream& line() { return indent(indentLevel); }
-    void endLine() { out << std::endl; }
-    void put(const char* s);
-    void putReg(AsmRegister r, bool bracketed = false) { put(registerName(r, bracketed)); }
+    // Line writing: the line's indentation, tokens, the end of the line. A
+    // line is gathered in the sink and handed to the stream whole at its end,
+    // followed by a flush of the stream, as std::endl would: whoever reads the
+    // stream sees every line as soon as it is complete.
+    TextOut& line() { return sink.indent(indentLevel); }
+    void endLine() {
+        sink << '\n';
+        sink.flush();
+        out.flush();
+    }
+    void put(const char* s) { sink << s; }
+    void putUnsigned(unsigned long long v) { sink.writeUnsigned(v); }
+    void putInt(long long v) { sink.writeInt(v); }
+    void putReg(AsmRegister r, bool bracketed = false) { sink << registerText(r, bracketed); }
     void putOperand(ExprBase* e, bool useRegister);
     void putByteOperand(ExprBase* e);
     void putAddress(MEM* mem);  // "[A op B]"
@@ -176,7 +196,9 @@ private:
     void moveTempFromBinop(ExprBase* d, ExprBase* s);
     void moveOther(ExprBase* d, ExprBase* s);
 
-    UsedMap used;  // reused across subprograms
+    UsedTemps used;  // reused across subprograms
+    TextOut sink;
+    TextOut::Batch lines{sink};  // the sink gathers until endLine for the emitter's lifetime
 };
 
 }  // namespace ZOA

@@ -58,8 +58,10 @@ void DecompileASM::visit(BUF_TEMP* b) {
     line() << "lea ";
     putReg(x);
     put(", ");
-    put(sizePrefix(b));
-    out << 't' << b->getId() << "[ebp]";
+    sink << sizePrefixText(b);
+    put("t");
+    putUnsigned(b->getId());
+    put("[ebp]");
     endLine();
     assignRegister(b, x, false);
 }

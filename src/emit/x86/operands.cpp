@@ -3,6 +3,7 @@
 
 #include <zoa/stmt.h>
 
+#include <charconv>
 #include <cstdio>
 #include <cstring>
 #include <ostream>
@@ -14,7 +15,7 @@ namespace {
 
 struct TypeInfo {
     unsigned int size;       // bytes of a value
-    const char* prefix;      // size keyword of a memory operand
+    std::string_view prefix; // size keyword of a memory operand
     const char* directive;   // data directive of one element
     bool isSigned;
 };
@@ -55,10 +56,15 @@ const NameForm nameForms[] = {
 };
 constexpr unsigned int NAME_KIND_COUNT = sizeof(nameForms) / sizeof(nameForms[0]);
 
-void appendNumber(String& s, const char* format, unsigned int v) {
+void appendNumber(String& s, unsigned int v) {
     char buf[16];
-    int n = std::snprintf(buf, sizeof buf, format, v);
-    if (n > 0) s.append(buf, static_cast<std::size_t>(n));
+    auto r = std::to_chars(buf, buf + sizeof buf, v);
+    s.append(buf, static_cast<std::size_t>(r.ptr - buf));
+}
+
+// Plain decimal of an integer: the bytes printf's %d, %u, %llu or %lld give.
+template <class T> int decimal(char (&buf)[64], T v) {
+    return static_cast<int>(std::to_chars(buf, buf + sizeof buf, v).ptr - buf);
 }
 
 // memText of a NAME (see the class comment).
@@ -69,12 +75,12 @@ void setNameText(NAME* n, String& text) {
     text = form.prefix;
     if (n->getKind() == LABEL_REF) {
         text += ".La";
-        appendNumber(text, "%u", n->getId());
+        appendNumber(text, n->getId());
     } else if (form.fromText && !n->getStringValue().empty()) {
         text += n->getStringValue();
     } else {
         text += n->isDeclaredLocal() ? "nl" : "ng";
-        appendNumber(text, "%u", n->getId());
+        appendNumber(text, n->getId());
     }
 }
 
@@ -86,7 +92,10 @@ unsigned int DecompileASM::valueSize(ExprBase* e) {
     return infoOf(e->getDataType()).size;
 }
 
-const char* DecompileASM::sizePrefix(ExprBase* e) { return e ? infoOf(e->getDataType()).prefix : ""; }
+std::string_view DecompileASM::sizePrefixText(ExprBase* e) { return e ? infoOf(e->getDataType()).prefix : ""; }
+
+// The table's texts are literals, so the view's data is terminated.
+const char* DecompileASM::sizePrefix(ExprBase* e) { return sizePrefixText(e).data(); }
 
 const char* DecompileASM::dataDirective(DataType t) { return infoOf(t).directive; }
 
@@ -107,20 +116,18 @@ DecompileASM::ExprAnnotation* DecompileASM::ensureAnnotation(ExprBase* e) {
 }
 
 DecompileASM::OperandParts DecompileASM::operandParts(ExprBase* e, bool useRegister, bool byteForm) {
-    OperandParts p{"", "", 0};
+    OperandParts p{"", ""};
     if (!e) return p;
     NodeType kind = e->getNodeType();
     ExprAnnotation* a = kind == NAME_NODE ? ensureAnnotation(e) : annotationOf(e);
-    if (kind != CONST_NODE) p.prefix = byteForm ? "BYTE PTR " : sizePrefix(e);
+    if (kind != CONST_NODE) p.prefix = byteForm ? "BYTE PTR " : sizePrefixText(e);
     if (!a) return p;
     if (a->reg == NO_REGISTER || !useRegister) {
         if (kind == NAME_NODE) p.prefix = "";
-        p.text = a->memText.data();
-        p.length = a->memText.size();
+        p.text = {a->memText.data(), a->memText.size()};
     } else {
         AsmRegister r = byteForm ? registerOfClass(a->reg, LOW_BYTE) : a->reg;
-        p.text = registerName(r, a->isIndirect);
-        p.length = std::strlen(p.text);
+        p.text = registerText(r, a->isIndirect);
     }
     return p;
 }
@@ -128,41 +135,40 @@ DecompileASM::OperandParts DecompileASM::operandParts(ExprBase* e, bool useRegis
 std::string DecompileASM::operandText(ExprBase* e, bool useRegister) {
     OperandParts p = operandParts(e, useRegister, false);
     std::string s(p.prefix);
-    s.append(p.text, p.length);
+    s.append(p.text);
     return s;
 }
 
 std::string DecompileASM::byteOperandText(ExprBase* e) {
     OperandParts p = operandParts(e, true, true);
     std::string s(p.prefix);
-    s.append(p.text, p.length);
+    s.append(p.text);
     return s;
 }
 
-void DecompileASM::put(const char* s) { out.write(s, static_cast<std::streamsize>(std::strlen(s))); }
-
 void DecompileASM::putOperand(ExprBase* e, bool useRegister) {
     OperandParts p = operandParts(e, useRegister, false);
-    put(p.prefix);
-    out.write(p.text, static_cast<std::streamsize>(p.length));
+    sink << p.prefix << p.text;
 }
 
 void DecompileASM::putByteOperand(ExprBase* e) {
     OperandParts p = operandParts(e, true, true);
-    put(p.prefix);
-    out.write(p.text, static_cast<std::streamsize>(p.length));
+    sink << p.prefix << p.text;
 }
 
 void DecompileASM::putLabel(LABEL* l) {
     put(".La");
-    if (l) out << l->getId();
+    if (l) putUnsigned(l->getId());
 }
 
 // "t<id> = <offset>": makes t<id>[ebp] address the temporary's slot.
 void DecompileASM::writeTempSymbol(TEMP* t) {
     if (!t) return;
     ExprAnnotation* a = annotationOf(t);
-    line() << 't' << t->getId() << " = " << (a ? a->frameOffset : 0);
+    line() << 't';
+    putUnsigned(t->getId());
+    put(" = ");
+    putInt(a ? a->frameOffset : 0);
     endLine();
 }
 
@@ -188,12 +194,11 @@ void DecompileASM::visit(CONST* c) {
     case INT_U:
     case CHAR_S:
     case INT_S:
-        n = std::snprintf(buf, sizeof buf, "%d", static_cast<int>(static_cast<unsigned int>(c->getIValue())));
+        // The low 32 bits as a signed int, as printf's "%d" shows them.
+        n = decimal(buf, static_cast<int>(static_cast<unsigned int>(c->getIValue())));
         break;
-    case INT64_U:
-        n = std::snprintf(buf, sizeof buf, "%llu", static_cast<unsigned long long>(c->getIValue()));
-        break;
-    case INT64_S: n = std::snprintf(buf, sizeof buf, "%lld", c->getIValue()); break;
+    case INT64_U: n = decimal(buf, static_cast<unsigned long long>(c->getIValue())); break;
+    case INT64_S: n = decimal(buf, c->getIValue()); break;
     case FLOAT:
     case DOUBLE:
         // A huge double needs more room than buf: print it into memText itself.
@@ -224,7 +229,7 @@ void DecompileASM::visit(TEMP* t) {
     ExprAnnotation* a = ensureAnnotation(t);
     if (a->reg != NO_REGISTER || !a->memText.empty()) return;
     a->memText = "t";
-    appendNumber(a->memText, "%u", t->getId());
+    appendNumber(a->memText, t->getId());
     a->memText += "[ebp]";
 }
 
@@ -251,14 +256,15 @@ void DecompileASM::defineName(NAME* n) {
         endLine();
         line() << ".type " << sym << ",@object";
         endLine();
-        line() << ".size " << sym << ',' << values.size() * ExprBase::sizeOfDataType(t);
+        line() << ".size " << sym << ',';
+        putUnsigned(values.size() * ExprBase::sizeOfDataType(t));
         endLine();
-        out << sym << ':';
+        sink << sym << ':';
         endLine();
         for (ExprBase* e : values) {
             line() << dataDirective(t);
             if (e && e->getNodeType() == NAME_NODE) {
-                out << static_cast<NAME*>(e)->getStringValue();
+                sink << static_cast<NAME*>(e)->getStringValue();
                 endLine();
                 endLine();
                 continue;
@@ -275,7 +281,7 @@ void DecompileASM::defineName(NAME* n) {
         endLine();
         line() << ".align 4";
         endLine();
-        out << sym << ':';
+        sink << sym << ':';
         endLine();
         line() << ".string \"" << n->getStringValue() << '"';
         endLine();
@@ -286,13 +292,15 @@ void DecompileASM::defineName(NAME* n) {
         unsigned int size = ExprBase::sizeOfDataType(n->getDataType());
         line() << ".section .rodata";
         endLine();
-        line() << ".align " << size;
+        line() << ".align ";
+        putUnsigned(size);
         endLine();
         line() << ".type " << sym << ",@object";
         endLine();
-        line() << ".size " << sym << ',' << size;
+        line() << ".size " << sym << ',';
+        putUnsigned(size);
         endLine();
-        out << sym << ':';
+        sink << sym << ':';
         endLine();
         line() << dataDirective(n->getDataType());
         visitExpr(first);

@@ -1,16 +1,19 @@
 // The assembly emitter's register model: names, aliasing, reservation, allocation and loads.
 #include "emit/x86/decompile_asm.h"
 
+#include <cstdint>
+#include <string_view>
+
 namespace ZOA {
 
 namespace {
 
 struct RegisterText {
-    const char* plain;
-    const char* bracketed;
+    std::string_view plain;
+    std::string_view bracketed;
 };
 
-// Indexed by register number; null where a number has no text.
+// Indexed by register number; empty where a number has no text.
 const RegisterText registerTexts[NO_REGISTER] = {
     {"ah", "[ah]"}, {"al", "[al]"}, {"bh", "[bh]"}, {"bl", "[bl]"},
     {"ch", "[ch]"}, {"cl", "[cl]"}, {"dh", "[dh]"}, {"dl", "[dl]"},
@@ -28,13 +31,21 @@ AsmRegister reg(unsigned int n) { return static_cast<AsmRegister>(n); }
 // Register families: a, b, c, d have byte forms; di, si, bp, sp do not.
 bool hasByteForms(unsigned int family) { return family < 4; }
 
+// The slots set in a holder mask, lowest first (the order of the slot array).
+template <class F> void forEachSlot(std::uint32_t mask, F f) {
+    for (; mask; mask &= mask - 1) f(static_cast<unsigned int>(__builtin_ctz(mask)));
+}
+
 }  // namespace
 
-const char* DecompileASM::registerName(AsmRegister r, bool bracketed) {
+std::string_view DecompileASM::registerText(AsmRegister r, bool bracketed) {
     if (r == NO_REGISTER) return "";
-    if (r > NO_REGISTER || !registerTexts[r].plain) return "unknown register";
+    if (r > NO_REGISTER || registerTexts[r].plain.empty()) return "unknown register";
     return bracketed ? registerTexts[r].bracketed : registerTexts[r].plain;
 }
+
+// The texts are literals, so the view's data is terminated.
+const char* DecompileASM::registerName(AsmRegister r, bool bracketed) { return registerText(r, bracketed).data(); }
 
 AsmRegister DecompileASM::registerOfClass(AsmRegister r, RegClass cls) {
     if (r < 8) {
@@ -99,19 +110,35 @@ void DecompileASM::evict(ExprBase* holder) {
     }
 }
 
+namespace {
+
+// Bit r of aliases[h] is set when r is one of h's forms (registerOfClass of h
+// in some class): freeing r evicts a holder of h. Numbers without forms have
+// none. Worked out once from registerOfClass, so the two always agree.
+struct AliasTable {
+    std::uint64_t aliases[NO_REGISTER] = {};
+    AliasTable() {
+        for (unsigned int h = 0; h < NO_REGISTER; ++h)
+            for (RegClass c : {LOW_BYTE, HIGH_BYTE, DWORD, QWORD}) {
+                AsmRegister r = DecompileASM::registerOfClass(reg(h), c);
+                if (r < NO_REGISTER) aliases[h] |= std::uint64_t{1} << r;
+            }
+    }
+    bool aliased(AsmRegister held, AsmRegister r) const {
+        return held < NO_REGISTER && r < NO_REGISTER && (aliases[held] >> r & 1);
+    }
+};
+const AliasTable aliasTable;
+
+}  // namespace
+
 // Evicts every holder of r in any width, then clears r's reservation.
 void DecompileASM::freeRegister(AsmRegister r) {
     if (r == NO_REGISTER) return;
-    for (ExprBase*& holder : regHolders) {
-        if (!holder) continue;
-        ExprAnnotation* a = annotationOf(holder);
-        AsmRegister held = a ? a->reg : NO_REGISTER;
-        if (r == registerOfClass(held, LOW_BYTE) || r == registerOfClass(held, HIGH_BYTE) ||
-            r == registerOfClass(held, DWORD) || r == registerOfClass(held, QWORD)) {
-            evict(holder);
-            holder = nullptr;
-        }
-    }
+    forEachSlot(heldSlots, [&](unsigned int i) {
+        ExprAnnotation* a = annotationOf(regHolders[i]);
+        if (aliasTable.aliased(a ? a->reg : NO_REGISTER, r)) dropHolder(i);
+    });
     markRegister(r, false);
 }
 
@@ -123,11 +150,7 @@ AsmRegister DecompileASM::claimRegister(AsmRegister r) {
 
 void DecompileASM::resetRegisters() {
     for (bool& f : regInUse) f = false;
-    for (ExprBase*& holder : regHolders) {
-        if (!holder) continue;
-        evict(holder);
-        holder = nullptr;
-    }
+    forEachSlot(heldSlots, [&](unsigned int i) { dropHolder(i); });
 }
 
 // Between statements: a local temporary that has lost its register keeps its
@@ -135,19 +158,18 @@ void DecompileASM::resetRegisters() {
 // is released.
 void DecompileASM::releaseStatementRegisters(StmtBase* stmt) {
     if (!stmt || stmt->getNodeType() == SEQ_NODE) return;
-    for (ExprBase*& holder : regHolders) {
-        if (!holder) continue;
+    forEachSlot(heldSlots, [&](unsigned int i) {
+        ExprBase* holder = regHolders[i];
         ExprAnnotation* a = annotationOf(holder);
         AsmRegister held = a ? a->reg : NO_REGISTER;
         if (holder->getNodeType() == TEMP_NODE && static_cast<TEMP*>(holder)->getType() != ARGUMENT_TEMP &&
             held == NO_REGISTER) {
             if (a) a->isAssigned = false;
-            continue;
+            return;
         }
         markRegister(held, false);
-        evict(holder);
-        holder = nullptr;
-    }
+        dropHolder(i);
+    });
 }
 
 AsmRegister DecompileASM::allocateByte() {
@@ -203,13 +225,15 @@ AsmRegister DecompileASM::allocateForType(ExprBase* e) {
 // normally have isAssigned set, so with every register of a width reserved
 // this usually yields NO_REGISTER: values are never spilled.
 AsmRegister DecompileASM::stealRegister(RegClass cls) {
-    for (ExprBase* holder : regHolders) {
-        if (!holder || holder->getNodeType() != TEMP_NODE) continue;
+    for (std::uint32_t m = heldSlots; m; m &= m - 1) {
+        ExprBase* holder = regHolders[__builtin_ctz(m)];
+        if (holder->getNodeType() != TEMP_NODE) continue;
         ExprAnnotation* a = annotationOf(holder);
         if (a && !a->isAssigned && !a->isAddressBase && isRegisterOfClass(a->reg, cls)) return claimRegister(a->reg);
     }
-    for (ExprBase* holder : regHolders) {
-        if (!holder || holder->getNodeType() != TEMP_NODE) continue;
+    for (std::uint32_t m = heldSlots; m; m &= m - 1) {
+        ExprBase* holder = regHolders[__builtin_ctz(m)];
+        if (holder->getNodeType() != TEMP_NODE) continue;
         ExprAnnotation* a = annotationOf(holder);
         if (a && !a->isAssigned) {
             AsmRegister r = a->reg;
@@ -226,19 +250,17 @@ void DecompileASM::assignRegister(ExprBase* e, AsmRegister r, bool indirect) {
     if (!e) return;
     ExprAnnotation* a = ensureAnnotation(e);
     if (e->getNodeType() == MEM_NODE) {
-        for (ExprBase* holder : regHolders) {
-            if (!holder || holder->getNodeType() != TEMP_NODE) continue;
-            ExprAnnotation* h = annotationOf(holder);
+        forEachSlot(heldSlots, [&](unsigned int i) {
+            if (regHolders[i]->getNodeType() != TEMP_NODE) return;
+            ExprAnnotation* h = annotationOf(regHolders[i]);
             if (h && h->reg == r) h->isAddressBase = true;
-        }
+        });
     }
-    if (a->reg == NO_REGISTER) {
-        for (ExprBase*& holder : regHolders) {
-            if (!holder) {
-                holder = e;
-                break;
-            }
-        }
+    std::uint32_t freeSlots = ~heldSlots & ((std::uint32_t{1} << HOLDER_SLOTS) - 1);
+    if (a->reg == NO_REGISTER && freeSlots) {
+        unsigned int i = static_cast<unsigned int>(__builtin_ctz(freeSlots));
+        regHolders[i] = e;
+        heldSlots |= std::uint32_t{1} << i;
     }
     a->reg = r;
     a->isIndirect = indirect;

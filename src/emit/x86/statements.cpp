@@ -22,16 +22,16 @@ bool isDwordRegister(AsmRegister r) { return r >= EAX && r <= ESP; }
 // The operand shapes that select a MOVE row.
 enum Shape { ANY, TEMP_SHAPE, MEM_ANY, MEM_BINOP, MEM_OTHER, BINOP_SHAPE };
 
-bool matches(Shape s, ExprBase* e) {
-    switch (s) {
-    case ANY: return true;
-    case TEMP_SHAPE: return isKind(e, TEMP_NODE);
-    case MEM_ANY: return isKind(e, MEM_NODE);
-    case MEM_BINOP: return isAddressedByBinop(e);
-    case MEM_OTHER: return isKind(e, MEM_NODE) && !isAddressedByBinop(e);
-    case BINOP_SHAPE: return isKind(e, BINOP_NODE);
+// The shapes e has, one bit per Shape: one node type query per operand.
+unsigned int shapesOf(ExprBase* e) {
+    unsigned int bits = 1u << ANY;
+    switch (e ? e->getNodeType() : TREE_BASE_NODE) {
+    case TEMP_NODE: return bits | 1u << TEMP_SHAPE;
+    case MEM_NODE:
+        return bits | 1u << MEM_ANY | 1u << (isKind(static_cast<MEM*>(e)->getExpr(), BINOP_NODE) ? MEM_BINOP : MEM_OTHER);
+    case BINOP_NODE: return bits | 1u << BINOP_SHAPE;
+    default: return bits;
     }
-    return false;
 }
 
 // By relOp: the conditional jump mnemonic, null for a non-relation.
@@ -102,8 +102,10 @@ void DecompileASM::visit(MOVE* m) {
     writeNodeComment(m);
     ExprBase* d = m->getDst();
     ExprBase* s = m->getSrc();
+    unsigned int dShapes = shapesOf(d);
+    unsigned int sShapes = shapesOf(s);
     for (const Row& row : rows) {
-        if (matches(row.dst, d) && matches(row.src, s)) {
+        if ((dShapes >> row.dst & 1) && (sShapes >> row.src & 1)) {
             (this->*row.emit)(d, s);
             return;
         }
@@ -245,7 +247,7 @@ void DecompileASM::visit(CJUMP* c) {
             visitExpr(r);
             AsmRegister x = allocateForType(r);
             line() << "mov ";
-            put(sizePrefix(r));
+            sink << sizePrefixText(r);
             putReg(x);
             put(", ");
             putOperand(r, true);

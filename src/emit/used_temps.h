@@ -1,0 +1,50 @@
+// UsedTemps: the temporaries and calls a subprogram really uses, collected in one cheap walk.
+#ifndef ZOA_EMIT_USED_TEMPS_H
+#define ZOA_EMIT_USED_TEMPS_H
+
+#include "emit/used_nodes.h"
+
+#include <zoa/expr.h>
+#include <zoa/subprog.h>
+
+#include <vector>
+
+namespace ZOA {
+
+// Reaches the same nodes as UsedNodes (labels, statements, the return
+// temporary, the argument temporaries), so isUsed(t) is true exactly when
+// UsedNodes would record t as TEMP_NODE. It walks with a switch over the node
+// type (one virtual call per node instead of accept and visit) and marks the
+// subprogram's own temporaries in a vector indexed by id; any other temporary
+// that turns up (another subprogram's, or a copy sharing an id) goes to a map.
+// The buffers keep their capacity, so one collector reused across
+// subprograms allocates nothing per node.
+class UsedTemps {
+public:
+    void collect(SUBPROG* sp);
+    bool isUsed(const TEMP* t) const {
+        if (!t) return false;
+        unsigned int id = t->getId();
+        if (id < own.size() && own[id] == t) return used[id] != 0;
+        return others.contains(t);
+    }
+    // Every CALL reached, in walk order; a call reached twice is listed twice.
+    const std::vector<CALL*>& calls() const { return callList; }
+
+private:
+    void walk(TreeBase* n);
+    void mark(TEMP* t) {
+        unsigned int id = t->getId();
+        if (id < own.size() && own[id] == t) used[id] = 1;
+        else others.assign(t, TEMP_NODE);
+    }
+
+    std::vector<const TEMP*> own;     // the subprogram's temporaries by id
+    std::vector<unsigned char> used;  // by id
+    UsedMap others;
+    std::vector<CALL*> callList;
+};
+
+}  // namespace ZOA
+
+#endif
