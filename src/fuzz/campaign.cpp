@@ -277,7 +277,7 @@ CampaignStats runDifferential(const CampaignOptions& o) {
     unsigned shrunk = 0;
     // Only the driver is compiled in assembly mode: one level is enough.
     const std::vector<std::string> levels =
-        o.mode == Mode::ASM ? std::vector<std::string>{"-O0"} : levels;
+        o.mode == Mode::ASM ? std::vector<std::string>{"-O0"} : o.optLevels;
 
     auto flush = [&]() {
         if (batch.empty()) return;
