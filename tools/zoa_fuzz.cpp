@@ -38,6 +38,8 @@ int main(int argc, char** argv) {
             o.workDir = value("--workdir=");
         } else if (!value("--shrink=").empty()) {
             o.shrinkLimit = static_cast<unsigned>(std::strtoul(value("--shrink=").c_str(), nullptr, 10));
+        } else if (!value("--asm-quirks=").empty()) {
+            o.asmQuirks = static_cast<unsigned>(std::strtoul(value("--asm-quirks=").c_str(), nullptr, 0));
         } else if (!value("--levels=").empty()) {
             o.optLevels.clear();
             std::string l = value("--levels=");

@@ -41,7 +41,8 @@ struct Prepared {
     std::uint64_t seed = 0;
     std::string prefix;
     std::string text;
-    std::string c;
+    std::string c;  // the C text, or the assembly text in assembly mode
+    bool assembly = false;
     unsigned fileNames = 0;
     std::vector<Call> calls;
 };
@@ -86,6 +87,7 @@ bool prepareUnit(ZOA_file& unit, const std::vector<Entry>& entries, Prepared& p,
             return false;
         }
     p.fileNames = static_cast<unsigned>(unit.getNames().size());
+    p.assembly = unit.IsAsmMode();
     interpret(unit, entries, p, stats);
     std::ostringstream c;
     unit.decompile(c);
@@ -117,6 +119,58 @@ void writeText(const std::string& path, const std::string& text) {
     std::ofstream(path, std::ios::binary) << text;
 }
 
+bool isRegister(const std::string& w) {
+    static const char* const regs[] = {"eax", "ebx", "ecx", "edx", "esi", "edi", "ebp", "esp",
+                                       "al", "ah", "bl", "bh", "cl", "ch", "dl", "dh"};
+    for (const char* r : regs)
+        if (w == r) return true;
+    return false;
+}
+bool isNumbered(const std::string& w, std::size_t prefixLen) {
+    if (w.size() <= prefixLen) return false;
+    for (std::size_t i = prefixLen; i < w.size(); ++i)
+        if (w[i] < '0' || w[i] > '9') return false;
+    return true;
+}
+
+// Makes one unit's assembly assemblable next to other units in one file: GNU as
+// refuses a size keyword on a register operand, so "BYTE PTR " and "DWORD PTR "
+// before a register go; labels (.La<n>) and frame offsets (t<n>) are numbered
+// per subprogram, so each subprogram gets its own; file-level data names
+// (ng<n>) get the unit's prefix.
+void appendAssemblable(std::string& out, const std::string& text, const std::string& prefix) {
+    unsigned sub = 0;
+    std::string word;
+    auto wordChar = [](char c) {
+        return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') || c == '_' || c == '.';
+    };
+    static const std::string startMark = ".intel_syntax noprefix";
+    for (std::size_t i = 0; i < text.size();) {
+        if (text.compare(i, startMark.size(), startMark) == 0) ++sub;
+        if (!wordChar(text[i]) || (i > 0 && wordChar(text[i - 1]))) {
+            out += text[i++];
+            continue;
+        }
+        std::size_t j = i;
+        while (j < text.size() && wordChar(text[j])) ++j;
+        word.assign(text, i, j - i);
+        if ((word == "BYTE" || word == "DWORD") && text.compare(j, 5, " PTR ") == 0) {
+            std::size_t k = j + 5, e = k;
+            while (e < text.size() && wordChar(text[e])) ++e;
+            if (isRegister(text.substr(k, e - k))) {
+                i = k;
+                continue;
+            }
+        }
+        if (word[0] == 't' && isNumbered(word, 1)) out += "t" + prefix + std::to_string(sub) + "_" + word.substr(1);
+        else if (word.compare(0, 3, ".La") == 0 && isNumbered(word, 3)) out += ".L" + prefix + std::to_string(sub) + "_" + word.substr(3);
+        else if (word.compare(0, 2, "ng") == 0 && isNumbered(word, 2)) out += prefix + word;
+        else out += word;
+        i = j;
+    }
+    out += "\n";
+}
+
 struct BuildResult {
     bool built = false;
     std::string detail;  // compiler message or first difference
@@ -130,11 +184,13 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
     units_c = "typedef long long int64;\ntypedef unsigned long long uint64;\n";
     driver_c = "#include <stdio.h>\ntypedef long long int64;\ntypedef unsigned long long uint64;\n";
     std::string body;
+    std::string units_s;
     for (const Prepared* p : units) {
+        if (p->assembly) appendAssemblable(units_s, p->c, p->prefix);
         // File-level names are ng<id> in every unit: keep each unit's apart.
         for (unsigned k = 0; k < p->fileNames; ++k)
             units_c += "#define ng" + std::to_string(k) + " " + p->prefix + "ng" + std::to_string(k) + "\n";
-        units_c += p->c;
+        if (!p->assembly) units_c += p->c;
         for (unsigned k = 0; k < p->fileNames; ++k) units_c += "#undef ng" + std::to_string(k) + "\n";
         std::string declared;
         for (const Call& c : p->calls) {
@@ -157,12 +213,17 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
         driver_c += declared;
     }
     driver_c += "int main(void)\n{\n" + body + "    return 0;\n}\n";
-    writeText(dir + "/units.c", units_c);
+    bool assembly = !units.empty() && units.front()->assembly;
+    std::string unitsFile = dir + (assembly ? "/units.s" : "/units.c");
+    writeText(unitsFile, assembly ? units_s : units_c);
     writeText(dir + "/driver.c", driver_c);
     BuildResult r;
     std::string out;
     std::string prog = dir + "/prog" + level;
-    if (shell("gcc -m32 " + level + " -w -fno-strict-aliasing -o " + prog + " " + dir + "/units.c " + dir + "/driver.c", &out) != 0) {
+    // The assembly is position-dependent (OFFSET FLAT:) and assumes nothing of
+    // the stack's alignment at a call.
+    std::string flags = assembly ? " -no-pie -mstackrealign" : " -fno-strict-aliasing";
+    if (shell("gcc -m32 " + level + " -w" + flags + " -o " + prog + " " + unitsFile + " " + dir + "/driver.c", &out) != 0) {
         r.detail = out.substr(0, 2000);
         return r;
     }
@@ -182,7 +243,7 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
         bool ga = static_cast<bool>(std::getline(a, la)), gb = static_cast<bool>(std::getline(b, lb));
         if (!ga && !gb) break;
         if (!ga || !gb || la != lb) {
-            r.detail = "compiled (" + level + "): " + (ga ? la : "<nothing, exit " + std::to_string(st) + ">") +
+            r.detail = (assembly ? "assembled: " : "compiled (" + level + "): ") + (ga ? la : "<nothing, exit " + std::to_string(st) + ">") +
                        "\ninterpreted: " + (gb ? lb : "<nothing>");
             break;
         }
@@ -214,20 +275,23 @@ CampaignStats runDifferential(const CampaignOptions& o) {
     std::vector<Prepared> batch;
     std::vector<std::vector<Entry>> batchEntries;
     unsigned shrunk = 0;
+    // Only the driver is compiled in assembly mode: one level is enough.
+    const std::vector<std::string> levels =
+        o.mode == Mode::ASM ? std::vector<std::string>{"-O0"} : o.optLevels;
 
     auto flush = [&]() {
         if (batch.empty()) return;
         std::vector<const Prepared*> all;
         for (const Prepared& p : batch) all.push_back(&p);
         bool allSame = true;
-        for (const std::string& level : o.optLevels) {
+        for (const std::string& level : levels) {
             BuildResult r = buildAndCompare(all, o.workDir, level);
             ++stats.programsBuilt;
             allSame = allSame && r.same;
         }
         if (!allSame) {  // isolate the failing units
             for (std::size_t i = 0; i < batch.size(); ++i) {
-                for (const std::string& level : o.optLevels) {
+                for (const std::string& level : levels) {
                     BuildResult r = buildAndCompare({&batch[i]}, o.workDir, level);
                     if (r.same) continue;
                     Failure f{batch[i].seed, r.built ? "mismatch" : "build", r.detail, batch[i].text, ""};
@@ -239,7 +303,7 @@ CampaignStats runDifferential(const CampaignOptions& o) {
                         std::vector<Entry> entries = batchEntries[i];
                         std::string prefix = batch[i].prefix, kind = f.kind;
                         f.reduced = shrink(f.text, [&](const std::string& t) {
-                            return textFails(t, entries, prefix, o.workDir, o.optLevels, kind);
+                            return textFails(t, entries, prefix, o.workDir, levels, kind);
                         }, 800);
                         writeText(base + ".min.zoa", f.reduced);
                         if (o.log) *o.log << "  reduced: " << base << ".min.zoa\n";
@@ -259,7 +323,7 @@ CampaignStats runDifferential(const CampaignOptions& o) {
         Prepared p;
         p.seed = seed;
         p.prefix = "u" + std::to_string(seed) + "_";
-        Generated g = generate(seed, o.mode, p.prefix);
+        Generated g = generate(seed, o.mode, p.prefix, o.asmQuirks);
         p.text = text::write(*g.unit);
         stats.seeds++;
         stats.subprogs += static_cast<unsigned>(g.entries.size());
@@ -282,8 +346,12 @@ void report(std::ostream& os, const CampaignOptions& o, const CampaignStats& s) 
     unsigned dropped = 0;
     for (const auto& [why, n] : s.dropped) dropped += n;
     os << "seeds " << o.firstSeed << ".." << (o.firstSeed + o.seeds - 1) << ": " << s.seeds << " units, "
-       << s.subprogs << " subprograms, " << s.callsCompared << " calls compared at each of";
-    for (const std::string& l : o.optLevels) os << ' ' << l;
+       << s.subprogs << " subprograms, " << s.callsCompared << " calls compared";
+    if (o.mode == Mode::ASM) os << " with the assembly output";
+    else {
+        os << " at each of";
+        for (const std::string& l : o.optLevels) os << ' ' << l;
+    }
     os << ", " << dropped << " calls without a C meaning left out, " << s.programsBuilt << " programs built, "
        << s.failures.size() << " failures\n";
     std::vector<std::pair<unsigned, std::string>> reasons;

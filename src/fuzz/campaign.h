@@ -22,6 +22,7 @@ struct CampaignOptions {
     std::string workDir = "/tmp/zoa-fuzz";  // scratch files and reproducers
     unsigned shrinkLimit = 3;               // failures shrunk per campaign
     std::ostream* log = nullptr;            // progress and failures
+    unsigned asmQuirks = 0;                 // AsmQuirk bits the assembly mode may generate
 };
 
 struct Failure {

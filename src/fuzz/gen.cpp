@@ -15,6 +15,7 @@ unsigned sizeOf(DataType t) { return ExprBase::sizeOfDataType(t); }
 
 const DataType cTypes[] = {CHAR_U, INT_U, INT64_U, CHAR_S, INT_S, INT64_S};
 const DataType asmTypes[] = {CHAR_U, INT_U, CHAR_S, INT_S};
+const DataType asmPlainTypes[] = {CHAR_U, INT_U, INT_S};
 
 // Casts whose C text yields each type; a type without one has none here.
 const std::vector<UnopKind>& castsTo(DataType t) {
@@ -61,12 +62,12 @@ struct Table {
 
 class Builder {
 public:
-    Builder(std::uint64_t seed, Mode mode, const std::string& prefix)
-        : rng(seed * 0x9E3779B97F4A7C15ull + 12345), mode(mode), prefix(prefix) {}
+    Builder(std::uint64_t seed, Mode mode, const std::string& prefix, unsigned asmQuirks)
+        : rng(seed * 0x9E3779B97F4A7C15ull + 12345), mode(mode), prefix(prefix), quirks(asmQuirks) {}
 
     Generated build() {
         Generated g;
-        g.unit = std::make_unique<ZOA_file>(true, false);
+        g.unit = std::make_unique<ZOA_file>(true, mode == Mode::ASM);
         unit = g.unit.get();
         makeFileData();
         unsigned n = 1 + below(4);
@@ -99,6 +100,7 @@ private:
     std::mt19937_64 rng;
     Mode mode;
     std::string prefix;
+    unsigned quirks;
     ZOA_file* unit = nullptr;
     std::vector<Fn> fns;
     std::vector<Table> tables;
@@ -122,7 +124,7 @@ private:
     T pick(const std::vector<T>& v) { return v[below(static_cast<unsigned>(v.size()))]; }
 
     DataType anyType(bool allowReal) {
-        if (mode == Mode::ASM) return pick(asmTypes);
+        if (mode == Mode::ASM) return quirks & SIGNED_CHAR ? pick(asmTypes) : pick(asmPlainTypes);
         if (allowReal && chance(6)) return chance(50) ? FLOAT : DOUBLE;
         return pick(cTypes);
     }
@@ -203,6 +205,7 @@ private:
     // The address of a cell of type t, or null when there is none to use.
     ExprBase* address(DataType t, bool forStore) {
         unsigned size = sizeOf(t);
+        if (mode == Mode::ASM && size == 1 && !(quirks & BYTE_MEMORY)) return nullptr;
         std::vector<int> options;
         for (std::size_t i = 0; i < regions.size(); ++i)
             if (regions[i].size >= size && (!forStore || regions[i].writable)) options.push_back(static_cast<int>(i));
@@ -235,7 +238,38 @@ private:
         exprs.push_back(e);
         return e;
     }
+    // The assembly output keeps values in registers only within a statement and
+    // frees them between the statements of a sequence: its mode writes
+    // three-address code, one operator on leaves per statement.
+    ExprBase* asmOperand(DataType t) {
+        if (TEMP* v = varOf(t, chance(70) || !(quirks & MIXED_WIDTHS))) return v;
+        return constant(t);
+    }
+    ExprBase* asmExpr(DataType t) {
+        switch (below(5)) {
+            case 0:
+            case 1:
+            case 2: {
+                static const BinopKind ops[] = {PLUS, MINUS, MUL};
+                BinopKind op = pick(ops);
+                if (op == MUL && !(quirks & MUL_RESULT)) op = PLUS;
+                return new BINOP(t, op, asmOperand(t), asmOperand(t));
+            }
+            case 3: {
+                static const BinopKind rels[] = {EQ, NE, LT, LE, GT, GE};
+                DataType u = anyType(false);
+                if (sizeOf(t) == 1 && !(quirks & CHAR_RELATION)) return asmOperand(t);
+                if (u != INT_S && !(quirks & UNSIGNED_RELATION)) u = INT_S;
+                return new BINOP(t, pick(rels), asmOperand(u), asmOperand(u));
+            }
+            default:
+                if ((t == INT_S || t == INT_U) && (quirks & WIDENING))
+                    return new UNOP(t, CONV4, asmOperand(chance(50) ? CHAR_S : CHAR_U));
+                return asmOperand(t);
+        }
+    }
     ExprBase* exprInner(DataType t, unsigned depth) {
+        if (mode == Mode::ASM) return asmExpr(t);
         if (depth == 0 || chance(25)) {
             if (chance(20))
                 if (ExprBase* a = address(t, false)) return new MEM(t, a);
@@ -329,26 +363,43 @@ private:
 
     // ---- statements
     void add(StmtBase* s) {
-        cur->addStmt(s);
+        // In a sequence the assembly output frees the registers before each part.
+        bool wrap = mode == Mode::ASM && s->getNodeType() != JUMP_NODE && s->getNodeType() != CJUMP_NODE;
+        cur->addStmt(wrap ? new SEQ(s, nullptr) : s);
         made.push_back(s);
+    }
+    // A store through an address sum keeps its register reserved until the
+    // next label: the assembly mode starts one after each store.
+    void afterStore() {
+        if (mode != Mode::ASM) return;
+        LABEL* next = sp->createNewLabel(REGULAR_LABEL);
+        jumpTo(next);
+        cur = next;
     }
     void jumpTo(LABEL* l) { add(new JUMP(l)); }
     unsigned exprDepth() { return 1 + below(3); }
 
     void assign() {
         TEMP* v = pick(vars);
+        if (mode == Mode::ASM && chance(25))
+            if (ExprBase* a = address(v->getDataType(), false)) return add(new MOVE(v, new MEM(v->getDataType(), a)));
         add(new MOVE(v, expr(v->getDataType(), exprDepth())));
     }
     void store() {
         DataType t = anyType(true);
-        if (ExprBase* a = address(t, true)) add(new MOVE(new MEM(t, a), expr(t, exprDepth())));
-        else assign();
+        ExprBase* a = address(t, true);
+        if (!a) return assign();
+        if (mode != Mode::ASM) return add(new MOVE(new MEM(t, a), expr(t, exprDepth())));
+        TEMP* v = varOf(t, true);
+        if (!v) return assign();
+        add(new MOVE(new MEM(t, a), v));
+        afterStore();
     }
     void callOne() {
         if (fnIndex == 0) return assign();
         const Fn& f = fns[below(fnIndex)];
         std::vector<ExprBase*> args;
-        for (DataType p : f.params) args.push_back(expr(p, 2));
+        for (DataType p : f.params) args.push_back(mode == Mode::ASM ? asmOperand(p) : expr(p, 2));
         CALL* c;
         if (mode == Mode::C && chance(25)) {
             TEMP* fp = sp->getTemp(POINTER, 0, IN_USE_TEMP);
@@ -380,7 +431,9 @@ private:
         LABEL* lt = sp->createNewLabel(REGULAR_LABEL);
         LABEL* lf = sp->createNewLabel(REGULAR_LABEL);
         LABEL* join = sp->createNewLabel(REGULAR_LABEL);
-        add(new CJUMP(pick(rels), expr(u, 2), expr(u, 2), lt, lf));
+        if (mode == Mode::ASM && u != INT_S && !(quirks & UNSIGNED_RELATION)) u = INT_S;
+        if (mode == Mode::ASM) add(new CJUMP(pick(rels), asmOperand(u), asmOperand(u), lt, lf));
+        else add(new CJUMP(pick(rels), expr(u, 2), expr(u, 2), lt, lf));
         cur = lt;
         statements(budget / 2, nest + 1);
         jumpTo(join);
@@ -460,8 +513,16 @@ private:
         } else {
             base = sp->getTemp(POINTER, size, IN_USE_TEMP);
         }
-        for (unsigned off = 0; off < size; off += 4)
-            add(new MOVE(new MEM(INT_U, new BINOP(POINTER, PLUS, base, intConst(INT_S, off))), intConst(INT_U, fitTo(INT_U, interesting()))));
+        TEMP* fill = mode == Mode::ASM ? sp->getTemp(INT_U, 0, IN_USE_TEMP) : nullptr;
+        for (unsigned off = 0; off < size; off += 4) {
+            ExprBase* value = intConst(INT_U, fitTo(INT_U, interesting()));
+            if (fill) {
+                add(new MOVE(fill, value));
+                value = fill;
+            }
+            add(new MOVE(new MEM(INT_U, new BINOP(POINTER, PLUS, base, intConst(INT_S, off))), value));
+            afterStore();
+        }
         regions.push_back({base, size, true});
     }
 
@@ -484,7 +545,8 @@ private:
             vars.push_back(sp->getReturnTemp());
         }
         readable = vars;
-        for (unsigned k = 0, nb = below(3); k < nb; ++k) region(8u << below(3));
+        for (unsigned k = 0, nb = below(3); k < nb; ++k)
+            if (mode != Mode::ASM || (quirks & BUFFERS)) region(8u << below(3));
         // Tables read through a pointer temporary: byte offsets in every output.
         for (std::size_t k = 0; k < fileTables; ++k)
             if (chance(50) || mode == Mode::ASM) {
@@ -538,8 +600,8 @@ private:
 
 }  // namespace
 
-Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix) {
-    return Builder(seed, mode, prefix).build();
+Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix, unsigned asmQuirks) {
+    return Builder(seed, mode, prefix, asmQuirks).build();
 }
 
 }  // namespace ZOA::fuzz

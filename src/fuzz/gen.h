@@ -19,6 +19,20 @@ enum class Mode {
           // statements after jumps, null SEQ sides, unused temps, deep nesting
 };
 
+// Constructs whose assembly, written by the assembly output's rules, computes
+// another value than the C text means (docs/assembly-limits.md). The assembly
+// mode leaves them out unless asked for.
+enum AsmQuirk : unsigned {
+    SIGNED_CHAR = 1,    // CHAR_S values
+    MUL_RESULT = 2,     // MUL
+    WIDENING = 4,       // CONV4 of a char
+    MIXED_WIDTHS = 8,   // operands of another integer type than the operator's
+    UNSIGNED_RELATION = 16,  // relations on INT_U / CHAR_U operands
+    BYTE_MEMORY = 32,   // chars loaded or stored through an address sum
+    CHAR_RELATION = 64, // relations giving a char value
+    BUFFERS = 128,      // buffer temporaries filled through address sums
+};
+
 // A subprogram the driver calls, with the argument sets to call it on.
 struct Entry {
     std::string name;
@@ -34,7 +48,7 @@ struct Generated {
 
 // Builds the unit for `seed`; subprogram names start with `prefix`. The same
 // seed, mode and prefix always give the same unit.
-Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix);
+Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix, unsigned asmQuirks = 0);
 
 }  // namespace ZOA::fuzz
 

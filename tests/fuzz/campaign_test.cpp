@@ -33,6 +33,40 @@ TEST(Fuzz, DifferentialCampaignAgreesWithGcc) {
     EXPECT_GT(s.callsCompared, 3 * s.seeds);
 }
 
+TEST(Fuzz, AssemblyCampaignAgreesWithTheInterpreter) {
+    // The generated assembly subset is assembled, linked with a C driver and run.
+    fuzz::CampaignOptions o;
+    o.mode = fuzz::Mode::ASM;
+    o.firstSeed = 1;
+    o.seeds = 100;
+    o.batch = 100;
+    o.workDir = ZOA::testing::scratchDir();
+    o.shrinkLimit = 0;
+    std::ostringstream log;
+    o.log = &log;
+    fuzz::CampaignStats s = fuzz::runDifferential(o);
+    std::ostringstream rep;
+    fuzz::report(rep, o, s);
+    EXPECT_TRUE(s.failures.empty()) << rep.str() << log.str();
+    EXPECT_GT(s.callsCompared, 3 * s.seeds);
+    EXPECT_EQ(s.programsBuilt, 1u);
+}
+
+TEST(Fuzz, AssemblyCampaignReportsAQuirk) {
+    // MUL leaves the left operand recorded in eax: allowing it must show
+    // mismatches, or the comparison is not really looking at the assembly.
+    fuzz::CampaignOptions o;
+    o.mode = fuzz::Mode::ASM;
+    o.firstSeed = 1;
+    o.seeds = 30;
+    o.batch = 30;
+    o.workDir = ZOA::testing::scratchDir();
+    o.shrinkLimit = 0;
+    o.asmQuirks = fuzz::MUL_RESULT;
+    fuzz::CampaignStats s = fuzz::runDifferential(o);
+    EXPECT_FALSE(s.failures.empty());
+}
+
 TEST(Fuzz, GeneratedUnitsAreValidAndReproducible) {
     for (std::uint64_t seed = 1; seed <= 40; ++seed) {
         for (fuzz::Mode m : {fuzz::Mode::C, fuzz::Mode::ASM}) {
