@@ -298,7 +298,8 @@ void Writer::stmt(StmtBase* s, int ctx, int depth) {
             JUMP* j = static_cast<JUMP*>(s);
             os << "(JUMP ";
             if (j->getKind() == DIRECT_LABEL) {
-                if (!j->getTarget()) os << "label ";
+                // An unknown target is written as nil too: keep the kind explicit.
+                if (!j->getTarget() || !labels.count(j->getTarget())) os << "label ";
                 label(j->getTarget(), ctx);
             } else {
                 if (!j->getExpr()) os << "expr ";
