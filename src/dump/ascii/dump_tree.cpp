@@ -117,6 +117,13 @@ template <class List> void DumpTree::writeList(const char* label, const List& no
 
 void DumpTree::endBlock() { out << std::endl; }
 
+void DumpTree::children(std::initializer_list<TreeBase*> nodes) {
+    if (!recursive) return;
+    ++level;
+    for (TreeBase* child : nodes) descend(child);
+    --level;
+}
+
 void DumpTree::descend(TreeBase* child) {
     if (child) child->accept(this);
 }
@@ -126,10 +133,7 @@ void DumpTree::visit(UNOP* n) {
     writeIndent() << "Op: " << toString(n->getOp()) << std::endl;
     writeRef("Expr: (", n->getExpr());
     endBlock();
-    if (!recursive) return;
-    ++level;
-    descend(n->getExpr());
-    --level;
+    children({n->getExpr()});
 }
 
 void DumpTree::visit(BINOP* n) {
@@ -138,11 +142,7 @@ void DumpTree::visit(BINOP* n) {
     writeRef("Left: (", n->getLeft());
     writeRef("Right: (", n->getRight());
     endBlock();
-    if (!recursive) return;
-    ++level;
-    descend(n->getLeft());
-    descend(n->getRight());
-    --level;
+    children({n->getLeft(), n->getRight()});
 }
 
 void DumpTree::visit(CALL* n) {
@@ -208,10 +208,7 @@ void DumpTree::visit(MEM* n) {
     writeNodeHeader(n);
     writeRef("Expr: (", n->getExpr());
     endBlock();
-    if (!recursive) return;
-    ++level;
-    descend(n->getExpr());
-    --level;
+    children({n->getExpr()});
 }
 
 void DumpTree::visit(NAME* n) {
@@ -257,21 +254,14 @@ void DumpTree::visit(CJUMP* n) {
     writeRef("IfTrue: (", n->getIfTrue());
     writeRef("IfFalse: (", n->getIfFalse());
     endBlock();
-    if (!recursive) return;
-    ++level;
-    descend(n->getLeft());
-    descend(n->getRight());
-    --level;
+    children({n->getLeft(), n->getRight()});
 }
 
 void DumpTree::visit(EXP* n) {
     writeNodeHeader(n);
     writeRef("Expr: (", n->getExpr());
     endBlock();
-    if (!recursive) return;
-    ++level;
-    descend(n->getExpr());
-    --level;
+    children({n->getExpr()});
 }
 
 void DumpTree::visit(JUMP* n) {
@@ -314,11 +304,7 @@ void DumpTree::visit(MOVE* n) {
     writeRef("Dst: (", n->getDst());
     writeRef("Src: (", n->getSrc());
     endBlock();
-    if (!recursive) return;
-    ++level;
-    descend(n->getDst());
-    descend(n->getSrc());
-    --level;
+    children({n->getDst(), n->getSrc()});
 }
 
 void DumpTree::visit(SEQ* n) {
@@ -326,11 +312,7 @@ void DumpTree::visit(SEQ* n) {
     writeRef("Left: (", n->getLeft());
     writeRef("Right: (", n->getRight());
     endBlock();
-    if (!recursive) return;
-    ++level;
-    descend(n->getLeft());
-    descend(n->getRight());
-    --level;
+    children({n->getLeft(), n->getRight()});
 }
 
 void DumpTree::visit(SUBPROG* n) {

@@ -6,6 +6,7 @@
 #include <zoa/tree_base.h>
 #include <zoa/visitor.h>
 
+#include <initializer_list>
 #include <ostream>
 #include <string>
 #include <typeinfo>
@@ -72,6 +73,8 @@ private:
     void endBlock();
     // Dumps a child one level deeper; a null child is skipped.
     void descend(TreeBase* child);
+    // When recursive: the given children's blocks, one level deeper (nulls skipped).
+    void children(std::initializer_list<TreeBase*> nodes);
     const std::string& annotationClassName(const TreeAnnotation* a);
 
     int level;
