@@ -74,7 +74,7 @@ class Builder {
 public:
     Builder(Result& r, const Flavour* f) : result(r), flavourOverride(f) {}
 
-    void build(const std::vector<SNode>& forms);
+    void build(const SItems& forms);
 
 private:
     Result& result;
@@ -502,7 +502,7 @@ void Builder::unitItem(const SNode& n) {
     error(n.items[0], "unknown unit item '" + head + "'");
 }
 
-void Builder::build(const std::vector<SNode>& forms) {
+void Builder::build(const SItems& forms) {
     static const SNode nowhere{SNode::LIST, 1, 1, {}, 0, false, 0, {}};
     if (forms.empty()) error(nowhere, "empty input: expected (unit ...)");
     const SNode& u = forms[0];
@@ -534,7 +534,7 @@ std::string format(const Diagnostic& d) {
     return d.file + ":" + std::to_string(d.line) + ":" + std::to_string(d.column) + ": error: " + d.message;
 }
 
-void buildUnit(const std::vector<SNode>& forms, Result& result, const std::string& fileName,
+void buildUnit(const SItems& forms, Result& result, const std::string& fileName,
                const Flavour* flavour) {
     Builder b(result, flavour);
     try {
@@ -549,12 +549,12 @@ namespace {
 Result parseWith(std::string_view source, const std::string& fileName, const Flavour* flavour) {
     Result result;
     try {
-        std::vector<SNode> forms;
+        Forms forms;
         SyntaxError err;
         if (!readForms(source, forms, err))
             result.diagnostics_.push_back({fileName, err.line, err.column, err.message});
         else
-            buildUnit(forms, result, fileName, flavour);
+            buildUnit(forms.top, result, fileName, flavour);
     } catch (const std::exception& e) {
         result.diagnostics_.push_back({fileName, 1, 1, std::string("cannot read the text: ") + e.what()});
     }

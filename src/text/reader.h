@@ -12,7 +12,7 @@ namespace ZOA::text {
 // (subprograms, temps, labels, names, prototypes) run in the order written;
 // the statements of every (block ...) run after the whole form was read, so a
 // block may mention anything the unit declares.
-void buildUnit(const std::vector<SNode>& forms, Result& result, const std::string& fileName,
+void buildUnit(const SItems& forms, Result& result, const std::string& fileName,
                const Flavour* flavour);
 
 }  // namespace ZOA::text

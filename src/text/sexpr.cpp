@@ -3,6 +3,7 @@
 
 #include <zoa/text.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
@@ -158,15 +159,43 @@ bool lexNumber(Lexer& lx, SNode& n, SyntaxError& err) {
 
 }  // namespace
 
-bool readForms(std::string_view source, std::vector<SNode>& forms, SyntaxError& err) {
+SItems Forms::keep(SNode* first, SNode* last) {
+    std::size_t n = static_cast<std::size_t>(last - first);
+    if (n == 0) return {};
+    if (chunks_.empty() || used_ + n > capacity_) {
+        // Chunks double from a small first one: small texts stay small.
+        capacity_ = capacity_ == 0 ? firstChunk_ : capacity_ < 4096 ? capacity_ * 2 : capacity_;
+        if (capacity_ < n) capacity_ = n;
+        chunks_.emplace_back(new SNode[capacity_]);
+        used_ = 0;
+    }
+    SNode* to = chunks_.back().get() + used_;
+    std::move(first, last, to);
+    used_ += n;
+    return {to, n};
+}
+
+bool readForms(std::string_view source, Forms& forms, SyntaxError& err) {
     Lexer lx(source);
-    // Open lists, innermost last; the outermost collects into `forms`.
-    std::vector<SNode> open;
+    // Open lists, innermost last, each with where its items start in `pending`.
+    // Items wait on one stack and move into the forms' storage when their list
+    // closes.
+    std::vector<std::pair<SNode, std::size_t>> open;
+    std::vector<SNode> pending;
+    // About one node per six characters in written units.
+    forms.expect(source.size() / 6 + 16);
+    pending.reserve(64);
+    auto collect = [&](std::size_t from) {
+        SItems kept = forms.keep(pending.data() + from, pending.data() + pending.size());
+        pending.resize(from);
+        return kept;
+    };
     while (true) {
         lx.skipBlanks();
         if (lx.atEnd()) {
             if (!open.empty())
-                return fail(err, open.back().line, open.back().column, "'(' is never closed");
+                return fail(err, open.back().first.line, open.back().first.column, "'(' is never closed");
+            forms.top = collect(0);
             return true;
         }
         SNode n;
@@ -178,15 +207,16 @@ bool readForms(std::string_view source, std::vector<SNode>& forms, SyntaxError& 
                 return fail(err, n.line, n.column,
                             "nesting deeper than " + std::to_string(MAX_NESTING) + " levels");
             lx.advance();
-            open.push_back(std::move(n));
+            open.emplace_back(std::move(n), pending.size());
             continue;
         }
         if (c == ')') {
             if (open.empty()) return fail(err, n.line, n.column, "unexpected ')'");
             lx.advance();
-            SNode done = std::move(open.back());
+            SNode done = std::move(open.back().first);
+            done.items = collect(open.back().second);
             open.pop_back();
-            (open.empty() ? forms : open.back().items).push_back(std::move(done));
+            pending.push_back(std::move(done));
             continue;
         }
         if (c == '"') {
@@ -203,7 +233,7 @@ bool readForms(std::string_view source, std::vector<SNode>& forms, SyntaxError& 
         } else {
             return fail(err, n.line, n.column, "unexpected character " + charName(c));
         }
-        (open.empty() ? forms : open.back().items).push_back(std::move(n));
+        pending.push_back(std::move(n));
     }
 }
 
