@@ -62,12 +62,12 @@ struct Table {
 
 class Builder {
 public:
-    Builder(std::uint64_t seed, Mode mode, const std::string& prefix, unsigned asmQuirks)
-        : rng(seed * 0x9E3779B97F4A7C15ull + 12345), mode(mode), prefix(prefix), quirks(asmQuirks) {}
+    Builder(std::uint64_t seed, Mode mode, const std::string& prefix, unsigned asmQuirks, Target target)
+        : rng(seed * 0x9E3779B97F4A7C15ull + 12345), mode(mode), prefix(prefix), quirks(asmQuirks), target(target) {}
 
     Generated build() {
         Generated g;
-        g.unit = std::make_unique<ZOA_file>(true, mode == Mode::ASM);
+        g.unit = std::make_unique<ZOA_file>(target.isGcc, target.asmMode);
         unit = g.unit.get();
         makeFileData();
         unsigned n = 1 + below(4);
@@ -101,6 +101,7 @@ private:
     Mode mode;
     std::string prefix;
     unsigned quirks;
+    Target target;
     ZOA_file* unit = nullptr;
     std::vector<Fn> fns;
     std::vector<Table> tables;
@@ -601,7 +602,11 @@ private:
 }  // namespace
 
 Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix, unsigned asmQuirks) {
-    return Builder(seed, mode, prefix, asmQuirks).build();
+    return generate(seed, mode, prefix, asmQuirks, Target{true, mode == Mode::ASM});
+}
+
+Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix, unsigned asmQuirks, Target target) {
+    return Builder(seed, mode, prefix, asmQuirks, target).build();
 }
 
 }  // namespace ZOA::fuzz

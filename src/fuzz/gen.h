@@ -46,9 +46,17 @@ struct Generated {
     std::vector<Entry> entries;
 };
 
+// The output the unit is made for (its ZOA_file flavour).
+struct Target {
+    bool isGcc = true;
+    bool asmMode = false;
+};
+
 // Builds the unit for `seed`; subprogram names start with `prefix`. The same
-// seed, mode and prefix always give the same unit.
+// seed, mode and prefix always give the same tree. The unit is made for GCC C,
+// or for assembly in the assembly mode, unless a target is given.
 Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix, unsigned asmQuirks = 0);
+Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix, unsigned asmQuirks, Target target);
 
 }  // namespace ZOA::fuzz
 
