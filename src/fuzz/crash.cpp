@@ -67,7 +67,10 @@ unsigned runCrash(std::uint64_t firstSeed, unsigned seeds, std::ostream* log) {
         // subtrees made again for the assembly output (parsing is the slow part,
         // so only one flavour goes through the reader).
         decompileText(text, {false, false});
-        generate(seed, Mode::ODD, prefix, 0, Target{true, true}).unit->decompile(os);
+        {
+            QuietStdout quiet;  // the assembly output's per-subprogram note
+            generate(seed, Mode::ODD, prefix, 0, Target{true, true}).unit->decompile(os);
+        }
         ++done;
         if (log && (i + 1) % 500 == 0) *log << (i + 1) << " odd units\n" << std::flush;
     }
