@@ -1,5 +1,6 @@
 // Runs generated units through the interpreter and through gcc, and compares.
 #include "fuzz/campaign.h"
+#include "fuzz/quiet_stdout.h"
 
 #include <zoa/interp.h>
 #include <zoa/text.h>
@@ -90,7 +91,10 @@ bool prepareUnit(ZOA_file& unit, const std::vector<Entry>& entries, Prepared& p,
     p.assembly = unit.IsAsmMode();
     interpret(unit, entries, p, stats);
     std::ostringstream c;
-    unit.decompile(c);
+    {
+        QuietStdout quiet;
+        unit.decompile(c);
+    }
     p.c = c.str();
     return true;
 }

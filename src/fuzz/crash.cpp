@@ -1,32 +1,16 @@
 // Crash campaign: odd trees through every output; only crashes count.
 #include "fuzz/campaign.h"
+#include "fuzz/quiet_stdout.h"
 
 #include <zoa/interp.h>
 #include <zoa/text.h>
 #include <zoa/verify.h>
 
-#include <iostream>
 #include <ostream>
-#include <streambuf>
 
 namespace ZOA::fuzz {
 
 namespace {
-
-// Takes every character and keeps none: the outputs are written in full, but
-// no growing string buffer is paid for.
-class Discard : public std::streambuf {
-protected:
-    int_type overflow(int_type c) override { return traits_type::not_eof(c); }
-    std::streamsize xsputn(const char*, std::streamsize n) override { return n; }
-};
-
-// The DOT dump writes its node statistics to standard output: keep them out of the log.
-struct QuietStdout {
-    Discard sink;
-    std::streambuf* saved = std::cout.rdbuf(&sink);
-    ~QuietStdout() { std::cout.rdbuf(saved); }
-};
 
 void decompileText(const std::string& text, const text::Flavour& flavour) {
     text::Result r = text::parse(text, "odd.zoa", flavour);

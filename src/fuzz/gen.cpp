@@ -110,6 +110,8 @@ private:
     SUBPROG* sp = nullptr;
     unsigned fnIndex = 0;
     LABEL* cur = nullptr;
+    LABEL* byteLabel = nullptr;  // where byteHolds counts
+    unsigned byteHolds = 0;
     std::vector<TEMP*> vars;      // set at the start, assignable
     std::vector<TEMP*> readable;  // also loop counters while in their loop
     std::vector<Region> regions;
@@ -368,10 +370,27 @@ private:
         bool wrap = mode == Mode::ASM && s->getNodeType() != JUMP_NODE && s->getNodeType() != CJUMP_NODE;
         cur->addStmt(wrap ? new SEQ(s, nullptr) : s);
         made.push_back(s);
+        if (mode == Mode::ASM && holdsByteRegister(s)) {
+            if (cur != byteLabel) byteLabel = cur, byteHolds = 0;
+            if (++byteHolds == 2) newLabel();
+        }
+    }
+    // A relation's value (set<cc> into a byte register) and a char move keep
+    // their byte register until the next label; four of them leave a later
+    // char load without one. The assembly mode starts a label after two.
+    static bool holdsByteRegister(StmtBase* s) {
+        if (s->getNodeType() != MOVE_NODE) return false;
+        MOVE* m = static_cast<MOVE*>(s);
+        if (m->getDst() && sizeOf(m->getDst()->getDataType()) == 1) return true;
+        ExprBase* src = m->getSrc();
+        if (!src || src->getNodeType() != BINOP_NODE) return false;
+        BinopKind op = static_cast<BINOP*>(src)->getOp();
+        return op == EQ || op == NE || op == LT || op == LE || op == GT || op == GE;
     }
     // A store through an address sum keeps its register reserved until the
     // next label: the assembly mode starts one after each store.
-    void afterStore() {
+    void afterStore() { newLabel(); }
+    void newLabel() {
         if (mode != Mode::ASM) return;
         LABEL* next = sp->createNewLabel(REGULAR_LABEL);
         jumpTo(next);
