@@ -231,9 +231,21 @@ private:
         unsigned pow = 1;
         while (pow * 2 <= cells) pow *= 2;
         ExprBase* idx = index(pow);
+        if (mode == Mode::ASM && size > 1 && !(quirks & SCALED_INDEX)) return new BINOP(POINTER, PLUS, r.base, scaled(idx, size));
         ExprBase* off = size == 1 ? idx : new BINOP(idx->getDataType() == INT_U ? INT_U : INT_S, MUL, idx,
                                                     intConst(idx->getDataType() == INT_U ? INT_U : INT_S, size));
         return new BINOP(POINTER, PLUS, r.base, off);
+    }
+    // idx * size (a power of two) without a MUL, which would take eax from the
+    // buffer address beside it: a constant, or a temporary doubled in statements
+    // of its own before the one that uses it.
+    ExprBase* scaled(ExprBase* idx, unsigned size) {
+        if (idx->getNodeType() == CONST_NODE)
+            return intConst(INT_S, static_cast<CONST*>(idx)->getIValue() * static_cast<long long>(size));
+        TEMP* s = sp->getTemp(INT_S, 0, PERMANENT_TEMP);
+        add(new MOVE(s, idx));
+        for (unsigned k = 1; k < size; k *= 2) add(new MOVE(s, new BINOP(INT_S, PLUS, s, s)));
+        return s;
     }
 
     ExprBase* expr(DataType t, unsigned depth) {
@@ -566,7 +578,7 @@ private:
         }
         readable = vars;
         for (unsigned k = 0, nb = below(3); k < nb; ++k)
-            if (mode != Mode::ASM || (quirks & BUFFERS)) region(8u << below(3));
+            region(8u << below(3));
         // Tables read through a pointer temporary: byte offsets in every output.
         for (std::size_t k = 0; k < fileTables; ++k)
             if (chance(50) || mode == Mode::ASM) {

@@ -30,7 +30,7 @@ enum AsmQuirk : unsigned {
     UNSIGNED_RELATION = 16,  // relations on INT_U / CHAR_U operands
     BYTE_MEMORY = 32,   // chars loaded or stored through an address sum
     CHAR_RELATION = 64, // relations giving a char value
-    BUFFERS = 128,      // buffer temporaries filled through address sums
+    SCALED_INDEX = 128, // a MUL scaling the index in a buffer's address sum
 };
 
 // A subprogram the driver calls, with the argument sets to call it on.
