@@ -163,8 +163,8 @@ SItems Forms::keep(SNode* first, SNode* last) {
     std::size_t n = static_cast<std::size_t>(last - first);
     if (n == 0) return {};
     if (chunks_.empty() || used_ + n > capacity_) {
-        // Chunks double from a small first one: small texts stay small.
-        capacity_ = capacity_ == 0 ? firstChunk_ : capacity_ < 4096 ? capacity_ * 2 : capacity_;
+        // Chunks double from 64 to 512 nodes; a longer list gets one of its own size.
+        capacity_ = capacity_ == 0 ? 64 : capacity_ < 512 ? capacity_ * 2 : 512;
         if (capacity_ < n) capacity_ = n;
         chunks_.emplace_back(new SNode[capacity_]);
         used_ = 0;
@@ -182,8 +182,6 @@ bool readForms(std::string_view source, Forms& forms, SyntaxError& err) {
     // closes.
     std::vector<std::pair<SNode, std::size_t>> open;
     std::vector<SNode> pending;
-    // About one node per six characters in written units.
-    forms.expect(source.size() / 6 + 16);
     pending.reserve(64);
     auto collect = [&](std::size_t from) {
         SItems kept = forms.keep(pending.data() + from, pending.data() + pending.size());

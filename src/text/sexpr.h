@@ -46,13 +46,12 @@ const SNode& SItems::front() const { return first_[0]; }
 const SNode* SItems::end() const { return first_ + n_; }
 
 // What readForms read: the top-level forms, and the chunks that hold every
-// list's items (many lists to a chunk, so reading allocates little).
+// list's items (many lists to a chunk, so reading allocates little). Chunks
+// stay small enough for malloc to serve from memory it already has: large
+// ones are fresh pages on every read.
 class Forms {
 public:
     SItems top;
-
-    // Sizes the first chunk (a guess at the node count is enough).
-    void expect(std::size_t nodes) { firstChunk_ = nodes; }
 
     // Moves nodes [first, last) into the storage, contiguous, and views them.
     SItems keep(SNode* first, SNode* last);
@@ -61,7 +60,6 @@ private:
     std::vector<std::unique_ptr<SNode[]>> chunks_;
     std::size_t used_ = 0;
     std::size_t capacity_ = 0;
-    std::size_t firstChunk_ = 64;
 };
 
 struct SyntaxError {
