@@ -67,6 +67,12 @@ struct Flavour {
 // that no input can exhaust the stack.
 constexpr unsigned int MAX_NESTING = 4096;
 
+// Ids ascend, and ids a text skips are consumed one by one (so that later
+// nodes get the ids written). An id more than this many past the next free one
+// is refused with a diagnostic, so that a short text cannot make the reader
+// count to four billion.
+constexpr unsigned int MAX_ID_SKIP = 1u << 20;
+
 // Reads a whole text. Never throws; stops at the first error and reports it
 // (one diagnostic). Constructing the unit rewinds the arena: every node of an
 // earlier unit is given up, so write or output an earlier unit before parsing.

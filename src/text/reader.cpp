@@ -156,6 +156,8 @@ private:
     // (the ids in between are used up, as a client calling create*Id would).
     static void declareId(const SNode& n, unsigned int id, unsigned int& next, const char* what) {
         if (id < next) error(n, std::string(what) + " id '" + n.text + "' is used twice or out of order");
+        if (id - next > MAX_ID_SKIP)
+            error(n, std::string(what) + " id '" + n.text + "' skips more than " + std::to_string(MAX_ID_SKIP) + " ids");
     }
 
     ExprBase* expr(const SNode& n, int ctx);

@@ -57,6 +57,11 @@ std::vector<Bad> badInputs() {
         {"undeclared global", body("(MOVE t1 g5)"), "name 'g5' is not declared", 2, 20},
         {"bad call target", body("(EXP (CALL INT_S L2))"), "not 'L2'", 2, 28},
         {"empty buffer", std::string(head) + "(buffer t2 0)))", "size above 0", 2, 12},
+        // Found by the reader fuzzer: counting up to these ids took a minute.
+        {"huge name id", "(unit gcc(subprog s0 \"f\" INT_S  (name n0000000000000000003001407164 EXTERN_DATA_REF \"x\")))",
+         "name id 'n0000000000000000003001407164' skips more than 1048576 ids", 1, 39},
+        {"huge temp id", std::string(head) + "(temp t4000000000 INT_S)))", "skips more than", 2, 7},
+        {"huge label id", std::string(head) + "(label L3000000)))", "label id 'L3000000' skips", 2, 8},
         {"duplicate name", "(unit gcc (name g0 EXTERN_DATA_REF \"x\") (name g1 EXTERN_DATA_REF \"x\"))",
          "same as the earlier g0", 1, 41},
         {"foreign scope", body("(MOVE t1 s3:t1)"), "no such subprogram", 2, 20},
