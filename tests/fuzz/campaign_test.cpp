@@ -8,7 +8,9 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdint>
 #include <sstream>
+#include <string>
 
 #include "native.h"
 
@@ -16,38 +18,42 @@ namespace {
 
 using namespace ZOA;
 
-TEST(Fuzz, DifferentialCampaignAgreesWithGcc) {
+// Seeds first.. in one program, failures not shrunk.
+fuzz::CampaignOptions campaign(fuzz::Mode mode, std::uint64_t first, unsigned seeds) {
     fuzz::CampaignOptions o;
-    o.firstSeed = 1;
-    o.seeds = 200;
-    o.batch = 100;
+    o.mode = mode;
+    o.firstSeed = first;
+    o.seeds = seeds;
+    o.batch = seeds;
     o.workDir = ZOA::testing::scratchDir();
     o.shrinkLimit = 0;
+    return o;
+}
+
+std::string reportOf(const fuzz::CampaignOptions& o, const fuzz::CampaignStats& s) {
+    std::ostringstream rep;
+    fuzz::report(rep, o, s);
+    return rep.str();
+}
+
+TEST(Fuzz, DifferentialCampaignAgreesWithGcc) {
+    fuzz::CampaignOptions o = campaign(fuzz::Mode::C, 1, 200);
+    o.batch = 100;
     std::ostringstream log;
     o.log = &log;
     fuzz::CampaignStats s = fuzz::runDifferential(o);
-    std::ostringstream rep;
-    fuzz::report(rep, o, s);
-    EXPECT_TRUE(s.failures.empty()) << rep.str() << log.str();
+    EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
     // The campaign must really compare: most calls have a C meaning.
     EXPECT_GT(s.callsCompared, 3 * s.seeds);
 }
 
 TEST(Fuzz, AssemblyCampaignAgreesWithTheInterpreter) {
     // The generated assembly subset is assembled, linked with a C driver and run.
-    fuzz::CampaignOptions o;
-    o.mode = fuzz::Mode::ASM;
-    o.firstSeed = 1;
-    o.seeds = 100;
-    o.batch = 100;
-    o.workDir = ZOA::testing::scratchDir();
-    o.shrinkLimit = 0;
+    fuzz::CampaignOptions o = campaign(fuzz::Mode::ASM, 1, 100);
     std::ostringstream log;
     o.log = &log;
     fuzz::CampaignStats s = fuzz::runDifferential(o);
-    std::ostringstream rep;
-    fuzz::report(rep, o, s);
-    EXPECT_TRUE(s.failures.empty()) << rep.str() << log.str();
+    EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
     EXPECT_GT(s.callsCompared, 3 * s.seeds);
     EXPECT_EQ(s.programsBuilt, 1u);
 }
@@ -55,29 +61,16 @@ TEST(Fuzz, AssemblyCampaignAgreesWithTheInterpreter) {
 TEST(Fuzz, AssemblyModeLeavesAByteRegisterFree) {
     // Seed 104220 once made three relation values and a char move in one
     // label: every byte register held, the next load written without one.
-    fuzz::CampaignOptions o;
-    o.mode = fuzz::Mode::ASM;
-    o.firstSeed = 104220;
-    o.seeds = 1;
-    o.workDir = ZOA::testing::scratchDir();
-    o.shrinkLimit = 0;
+    fuzz::CampaignOptions o = campaign(fuzz::Mode::ASM, 104220, 1);
     fuzz::CampaignStats s = fuzz::runDifferential(o);
-    std::ostringstream rep;
-    fuzz::report(rep, o, s);
-    EXPECT_TRUE(s.failures.empty()) << rep.str();
+    EXPECT_TRUE(s.failures.empty()) << reportOf(o, s);
     EXPECT_GT(s.callsCompared, 0u);
 }
 
 TEST(Fuzz, AssemblyCampaignReportsAQuirk) {
     // MUL leaves the left operand recorded in eax: allowing it must show
     // mismatches, or the comparison is not really looking at the assembly.
-    fuzz::CampaignOptions o;
-    o.mode = fuzz::Mode::ASM;
-    o.firstSeed = 1;
-    o.seeds = 30;
-    o.batch = 30;
-    o.workDir = ZOA::testing::scratchDir();
-    o.shrinkLimit = 0;
+    fuzz::CampaignOptions o = campaign(fuzz::Mode::ASM, 1, 30);
     o.asmQuirks = fuzz::MUL_RESULT;
     fuzz::CampaignStats s = fuzz::runDifferential(o);
     EXPECT_FALSE(s.failures.empty());
