@@ -14,6 +14,16 @@
 
 namespace ZOA {
 
+// Which texts the outputs write.
+//  - EXACT (the default): the library's fixed texts, byte for byte, as golden
+//    tests and existing clients expect them, quirks included.
+//  - SOUND: every output means what the tree means and works as written: the
+//    C compiles on its own with gcc -m32 and computes what the tree says, the
+//    assembly assembles with GNU as, the DOT renders with Graphviz, and two
+//    runs of a dump give the same bytes. Diagnostic texts (node statistics,
+//    notes) go to the diagnostic stream, never into the output.
+enum class Profile { EXACT, SOUND };
+
 // Constructing a ZOA_file rewinds the arena: every node of an earlier unit is
 // given up. Build, output and abandon one unit at a time, on one thread.
 //
@@ -49,6 +59,7 @@ namespace ZOA {
 class ZOA_API ZOA_file {
 public:
     ZOA_file(bool isGcc, bool asmMode);
+    ZOA_file(bool isGcc, bool asmMode, Profile profile);
     ~ZOA_file();
     ZOA_file(const ZOA_file&) = delete;
     ZOA_file& operator=(const ZOA_file&) = delete;
@@ -56,6 +67,16 @@ public:
     bool IsGcc() const { return isGcc; }
     bool IsAsmMode() const { return asmMode; }
     unsigned int getMemoryUsage();
+
+    Profile getProfile() const { return profile; }
+    // The profile can change at any time; it is read when an output is written.
+    void setProfile(Profile p) { profile = p; }
+    // Where the outputs' diagnostic texts go (the DOT dump's node statistics,
+    // the assembly output's note): the given stream, or with null the
+    // profile's default, std::cout in the exact profile and std::cerr in the
+    // sound one. The stream must outlive the output calls.
+    void setDiagnosticStream(std::ostream* os) { diagnostics = os; }
+    std::ostream& getDiagnosticStream() const;
 
     // A new subprogram, appended to the unit; with addPrototype it is also
     // entered in the subprogram prototypes under its name.
@@ -92,6 +113,8 @@ private:
 
     bool isGcc;
     bool asmMode;
+    Profile profile = Profile::EXACT;
+    std::ostream* diagnostics = nullptr;
     std::list<SUBPROG*> subprogs;
     std::list<NAME*> names;
     std::map<std::string, CALL*> callPrototypes;

@@ -1,6 +1,8 @@
 // Printed names of the shared enumerations, one table per enumeration.
 #include <zoa/enums.h>
 
+#include "core/node_kinds.h"
+
 namespace ZOA {
 
 namespace {
@@ -25,14 +27,11 @@ const char* const unopNames[] = {"ABS",    "NEG",    "NOT",    "BITWISE_NOT", "C
                                  "CONV7",  "CONV8",  "CONV9",  "CONV10",      "CONV11", "CONV12", "CONV13",
                                  "CONV14", "CONV15", "CONV16", "CONV17",      "CONV18", "CONV19", "CONV20",
                                  "CONV21", "CONV22", "CONV23", "CONV24",      "CONV25", "CONV26"};
-const char* const nodeTypeNames[] = {"TreeBase", "ExprBase", "BINOP", "BUF_TEMP", "CALL",  "CONST",
-                                     "MEM",      "NAME",     "TEMP",  "UNOP",     "StmtBase", "CJUMP",
-                                     "EXP",      "JUMP",     "LABEL", "MOVE",     "SEQ",   "SUBPROG"};
+
 
 static_assert(sizeof(dataTypeNames) / sizeof(*dataTypeNames) == DATA_TYPE_COUNT, "one name per DataType");
 static_assert(sizeof(binopNames) / sizeof(*binopNames) == MAX_BINOP + 1, "one name per BinopKind");
 static_assert(sizeof(unopNames) / sizeof(*unopNames) == UNOP_KIND_COUNT, "one name per UnopKind");
-static_assert(sizeof(nodeTypeNames) / sizeof(*nodeTypeNames) == NODE_TYPE_COUNT, "one name per NodeType");
 
 }  // namespace
 
@@ -44,6 +43,9 @@ const char* toString(TempKind k) { return lookup(tempKindNames, k); }
 const char* toString(TempState s) { return lookup(tempStateNames, s); }
 const char* toString(BinopKind op) { return lookup(binopNames, op); }
 const char* toString(UnopKind op) { return lookup(unopNames, op); }
-const char* toString(NodeType t) { return lookup(nodeTypeNames, t); }
+const char* toString(NodeType t) {
+    std::string_view name = nodeKindName(t);
+    return name.empty() ? "?" : name.data();  // the names are literals: terminated
+}
 
 }  // namespace ZOA

@@ -2,6 +2,8 @@
 #include <zoa/stmt.h>
 #include <zoa/visitor.h>
 
+#include "core/op_facts.h"
+
 namespace ZOA {
 
 void EXP::accept(VisitorBase* v) { v->visit(this); }
@@ -44,17 +46,7 @@ void JUMP::replaceTarget(LABEL* l) {
 
 void CJUMP::accept(VisitorBase* v) { v->visit(this); }
 
-BinopKind CJUMP::notRel(BinopKind r) {
-    switch (r) {
-    case EQ: return NE;
-    case NE: return EQ;
-    case LT: return GE;
-    case LE: return GT;
-    case GT: return LE;
-    case GE: return LT;
-    default: return MAX_BINOP;
-    }
-}
+BinopKind CJUMP::notRel(BinopKind r) { return negatedRelation(r); }
 
 void CJUMP::replaceLeft(ExprBase* e) {
     if (left) left->freeNode();

@@ -2,6 +2,8 @@
 #include <zoa/tree_base.h>
 #include <zoa/visitor.h>
 
+#include "core/type_facts.h"
+
 namespace ZOA {
 
 TreeAnnotation::~TreeAnnotation() {}
@@ -19,21 +21,7 @@ void TreeBase::setAnnotation(TreeAnnotation* a, bool deleteOld) {
     annotation = a;
 }
 
-unsigned int ExprBase::sizeOfDataType(DataType t) {
-    switch (t) {
-    case CHAR_U:
-    case CHAR_S: return 1;
-    case INT_U:
-    case INT_S:
-    case FLOAT:
-    case POINTER: return 4;
-    case INT64_U:
-    case INT64_S:
-    case DOUBLE: return 8;
-    case VOID: return 0;
-    }
-    return 0;
-}
+unsigned int ExprBase::sizeOfDataType(DataType t) { return sizeOfType(t); }
 
 VisitorBase::~VisitorBase() {}
 

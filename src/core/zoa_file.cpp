@@ -1,9 +1,20 @@
 // ZOA_file: construction, subprograms, file-level names and prototypes.
 #include <zoa/zoa_file.h>
 
+#include <iostream>
+
 namespace ZOA {
 
-ZOA_file::ZOA_file(bool isGcc, bool asmMode) : isGcc(isGcc), asmMode(asmMode) { MemMgr::rewind(); }
+ZOA_file::ZOA_file(bool isGcc, bool asmMode) : ZOA_file(isGcc, asmMode, Profile::EXACT) {}
+
+ZOA_file::ZOA_file(bool isGcc, bool asmMode, Profile profile) : isGcc(isGcc), asmMode(asmMode), profile(profile) {
+    MemMgr::rewind();
+}
+
+std::ostream& ZOA_file::getDiagnosticStream() const {
+    if (diagnostics) return *diagnostics;
+    return profile == Profile::EXACT ? std::cout : std::cerr;
+}
 
 ZOA_file::~ZOA_file() {}
 

@@ -11,8 +11,13 @@ namespace ZOA {
 
 bool ZOA_file::decompile(std::ostream& os) {
     std::unique_ptr<DecompileBase> emitter;
-    if (asmMode) emitter.reset(new DecompileASM(os, isGcc));
-    else emitter.reset(new DecompileC(os, isGcc));
+    if (asmMode) {
+        auto* x86 = new DecompileASM(os, isGcc);
+        x86->setNoteStream(getDiagnosticStream());
+        emitter.reset(x86);
+    } else {
+        emitter.reset(new DecompileC(os, isGcc));
+    }
 
     for (NAME* n : names) emitter->defineName(n);
     os << std::endl;

@@ -42,60 +42,9 @@ bool DecompileBase::place(LABEL* l) {
     return true;
 }
 
-// Labels are placed from a FIFO work list (start label, the others by id, the
-// return label last). Placing a label walks its statements: an unconditional
-// jump to a label, or a conditional jump's false label, pulls its not yet
-// placed target right behind the label placed last, and the jump records that
-// predecessor in a TraceAnnotation so the emitter can leave it out. The walk is
-// depth first: a pulled label's statements come before those after the jump.
-void DecompileBase::buildTraces() {
-    SUBPROG* sp = curSubprog;
-    if (!sp) return;
-    std::vector<LABEL*> work;
-    work.reserve(sp->getAllLabels().size() + 1);
-    LABEL* start = sp->getStartLabel();
-    LABEL* ret = sp->getReturnLabel();
-    if (start) work.push_back(start);
-    for (const auto& entry : sp->getAllLabels())
-        if (entry.second != start && entry.second != ret) work.push_back(entry.second);
-    if (ret) work.push_back(ret);
+void DecompileBase::pulled(StmtBase* jump, LABEL* prev) { jump->setAnnotation(new TraceAnnotation(prev), true); }
 
-    LABEL* last = nullptr;
-    for (LABEL* l : work) {
-        if (!l || !place(l)) continue;
-        last = l;
-        if (!l->containsStmts()) continue;
-        const StmtList& stmts = l->getStmts();
-        for (auto it = stmts.rbegin(); it != stmts.rend(); ++it) pending.push_back(*it);
-        while (!pending.empty()) {
-            StmtBase* s = pending.back();
-            pending.pop_back();
-            traceStatement(s, last);
-        }
-    }
-}
-
-// One step: a SEQ queues its sides; a jump may pull its target, whose
-// statements are queued to run before anything queued earlier.
-void DecompileBase::traceStatement(StmtBase* s, LABEL*& last) {
-    if (!s) return;
-    NodeType k = s->getNodeType();
-    if (k == SEQ_NODE) {
-        SEQ* seq = static_cast<SEQ*>(s);
-        if (seq->getRight()) pending.push_back(seq->getRight());
-        if (seq->getLeft()) pending.push_back(seq->getLeft());
-        return;
-    }
-    LABEL* candidate = nullptr;
-    if (k == JUMP_NODE && static_cast<JUMP*>(s)->getKind() == DIRECT_LABEL) candidate = static_cast<JUMP*>(s)->getTarget();
-    else if (k == CJUMP_NODE) candidate = static_cast<CJUMP*>(s)->getIfFalse();
-    if (!candidate || !place(candidate)) return;
-    s->setAnnotation(new TraceAnnotation(last), true);
-    last = candidate;
-    if (!candidate->containsStmts()) return;
-    const StmtList& stmts = candidate->getStmts();
-    for (auto it = stmts.rbegin(); it != stmts.rend(); ++it) pending.push_back(*it);
-}
+void DecompileBase::buildTraces() { ZOA::buildTraces(curSubprog, *this, traceStack); }
 
 bool DecompileBase::fallsThrough(StmtBase* stmt) const {
     TreeAnnotation* a = stmt->getAnnotation();

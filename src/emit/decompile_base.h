@@ -2,6 +2,8 @@
 #ifndef ZOA_EMIT_DECOMPILE_BASE_H
 #define ZOA_EMIT_DECOMPILE_BASE_H
 
+#include "core/traces.h"
+
 #include <zoa/subprog.h>
 #include <zoa/tree_base.h>
 #include <zoa/visitor.h>
@@ -11,7 +13,7 @@
 
 namespace ZOA {
 
-class DecompileBase : public VisitorBase {
+class DecompileBase : public VisitorBase, private TraceListener {
 public:
     // Marks a label that already has its place in the trace order.
     class LABELAnnotation : public TreeAnnotation {
@@ -41,9 +43,10 @@ public:
     std::ostream& indent(unsigned int n);
     // Prints one subprogram through its visit, then resets the per-subprogram state.
     bool emitSubprogram(SUBPROG* sp);
-    // Orders curSubprog's labels so that jumps can fall through (see the .cpp).
+    // Orders curSubprog's labels into traceOrder so that jumps can fall
+    // through (core/traces.h), marking placed labels with a LABELAnnotation
+    // and each jump that pulled its target with a TraceAnnotation.
     void buildTraces();
-    void traceStatement(StmtBase* s, LABEL*& last);
     // True when stmt (a JUMP to a label, or a CJUMP's false branch) targets the
     // label printed right after curLabel, so the jump is left out.
     bool fallsThrough(StmtBase* stmt) const;
@@ -59,8 +62,9 @@ protected:
     std::ostream& out;
 
 private:
-    bool place(LABEL* l);
-    std::vector<StmtBase*> pending;  // reused work stack of buildTraces
+    bool place(LABEL* l) override;
+    void pulled(StmtBase* jump, LABEL* prev) override;
+    std::vector<StmtBase*> traceStack;  // reused by buildTraces
 };
 
 }  // namespace ZOA

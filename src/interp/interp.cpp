@@ -2,6 +2,8 @@
 #include <zoa/interp.h>
 #include <zoa/zoa.h>
 
+#include "core/traces.h"
+
 #include <cctype>
 #include <cmath>
 #include <cstdio>
@@ -11,7 +13,6 @@
 #include <ostream>
 #include <sstream>
 #include <unordered_map>
-#include <unordered_set>
 
 namespace ZOA::interp {
 
@@ -836,48 +837,23 @@ struct Machine::Impl {
         stop(Status::UNKNOWN_FUNCTION, "call of unknown function " + name);
     }
 
+    // The order the C text prints sp's labels in, and the jumps it leaves out.
     const Trace& traceOf(SUBPROG* sp) {
         auto it = traces.find(sp);
         if (it != traces.end()) return it->second;
         Trace& t = traces[sp];
-        std::unordered_set<const LABEL*> placed;
-        LABEL* last = nullptr;
-        auto place = [&](LABEL* l) {
-            placed.insert(l);
-            t.index[l] = t.order.size();
-            t.order.push_back(l);
-        };
-        std::function<void(StmtBase*)> traceStmt = [&](StmtBase* s) {
-            while (s && s->getNodeType() == SEQ_NODE) {
-                SEQ* q = static_cast<SEQ*>(s);
-                if (q->getLeft()) traceStmt(q->getLeft());
-                s = q->getRight();
+        struct Listener : TraceListener {
+            Trace& t;
+            explicit Listener(Trace& t) : t(t) {}
+            bool place(LABEL* l) override {
+                if (!t.index.emplace(l, t.order.size()).second) return false;
+                t.order.push_back(l);
+                return true;
             }
-            if (!s) return;
-            LABEL* cand = nullptr;
-            if (s->getNodeType() == JUMP_NODE && static_cast<JUMP*>(s)->getKind() == DIRECT_LABEL)
-                cand = static_cast<JUMP*>(s)->getTarget();
-            else if (s->getNodeType() == CJUMP_NODE)
-                cand = static_cast<CJUMP*>(s)->getIfFalse();
-            if (!cand || placed.count(cand)) return;
-            place(cand);
-            t.prev[s] = last;
-            last = cand;
-            if (cand->containsStmts())
-                for (StmtBase* x : cand->getStmts()) traceStmt(x);
-        };
-        std::vector<LABEL*> work;
-        work.push_back(sp->getStartLabel());
-        for (auto& [id, l] : sp->getAllLabels())
-            if (l != sp->getStartLabel() && l != sp->getReturnLabel()) work.push_back(l);
-        work.push_back(sp->getReturnLabel());
-        for (LABEL* l : work) {
-            if (!l || placed.count(l)) continue;
-            place(l);
-            last = l;
-            if (l->containsStmts())
-                for (StmtBase* x : l->getStmts()) traceStmt(x);
-        }
+            void pulled(StmtBase* jump, LABEL* prev) override { t.prev[jump] = prev; }
+        } listener(t);
+        std::vector<StmtBase*> stack;
+        buildTraces(sp, listener, stack);
         return t;
     }
 

@@ -1,4 +1,4 @@
-// DumpDot and ZOA_file::dumpDot: Graphviz digraphs of subprograms, node statistics on std::cout.
+// DumpDot and ZOA_file::dumpDot: Graphviz digraphs of subprograms, node statistics on the diagnostic stream.
 #include "dump/dot/dump_dot.h"
 
 #include <zoa/expr.h>
@@ -85,7 +85,7 @@ void putView(TextBuffer& text, std::string_view v) { text.append(v.data(), v.siz
 
 }  // namespace
 
-DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws)
+DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws, std::ostream* stats)
     : AllVisitor(sp),
       ownWorkspace(ws ? nullptr : new Workspace),
       workspace(ws ? *ws : *ownWorkspace),
@@ -101,7 +101,7 @@ DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws)
     // Temporaries and labels are most of what is collected once.
     workspace.declaredOnce.reserve(subprog->getAllTemps().size() + subprog->getAllLabels().size());
     subprog->accept(this);
-    writeStatistics(std::cout);
+    writeStatistics(stats ? *stats : std::cout);
     writeGraphHeader();
     writeKindBlocks();
     writeConnections();
@@ -480,7 +480,7 @@ void DumpDot::flushText() {
 
 bool ZOA_file::dumpDot(std::ostream& os) {
     DumpDot::Workspace workspace;
-    for (SUBPROG* sp : subprogs) DumpDot dump(sp, os, &workspace);
+    for (SUBPROG* sp : subprogs) DumpDot dump(sp, os, &workspace, &getDiagnosticStream());
     return true;
 }
 

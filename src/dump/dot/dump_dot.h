@@ -45,7 +45,8 @@ public:
         TextBuffer text;  // DOT text not yet handed to the stream
     };
 
-    DumpDot(SUBPROG* subprog, std::ostream& out, Workspace* workspace = nullptr);
+    // The node statistics go to `stats`, std::cout when it is null.
+    DumpDot(SUBPROG* subprog, std::ostream& out, Workspace* workspace = nullptr, std::ostream* stats = nullptr);
     ~DumpDot() override;
 
     void visit(UNOP* n) override;

@@ -23,7 +23,7 @@ unsigned int roundUp(unsigned int v, unsigned int to) { return (v + to - 1) / to
 
 }  // namespace
 
-DecompileASM::DecompileASM(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc), sink(os) {
+DecompileASM::DecompileASM(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc), notes(&std::cout), sink(os) {
     for (ExprBase*& h : regHolders) h = nullptr;
     for (bool& f : regInUse) f = false;
 }
@@ -40,7 +40,7 @@ void DecompileASM::declareCallPrototype(CALL*) {}
 void DecompileASM::visit(SUBPROG* sp) {
     line() << ".intel_syntax noprefix";
     endLine();
-    std::cout << "FIXME: implement dumpAllStaticData" << std::endl;
+    *notes << "FIXME: implement dumpAllStaticData" << std::endl;
     line() << ".text";
     endLine();
     if (!sp->isStatic()) {

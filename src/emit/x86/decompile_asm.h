@@ -81,6 +81,9 @@ public:
     DecompileASM(std::ostream& os, bool isGcc);
     ~DecompileASM() override;
 
+    // Where the per-subprogram note goes (std::cout unless set).
+    void setNoteStream(std::ostream& os) { notes = &os; }
+
     void visit(UNOP*) override;
     void visit(TEMP*) override;
     void visit(SUBPROG*) override;
@@ -196,6 +199,7 @@ private:
     void moveTempFromBinop(ExprBase* d, ExprBase* s);
     void moveOther(ExprBase* d, ExprBase* s);
 
+    std::ostream* notes;
     UsedTemps used;  // reused across subprograms
     TextOut sink;
     TextOut::Batch lines{sink};  // the sink gathers until endLine for the emitter's lifetime
