@@ -2,6 +2,8 @@
 #include "fuzz/campaign.h"
 #include "fuzz/quiet_stdout.h"
 
+#include "emit/c/c_texts.h"
+
 #include <zoa/interp.h>
 #include <zoa/text.h>
 #include <zoa/verify.h>
@@ -12,6 +14,7 @@
 #include <functional>
 #include <ostream>
 #include <sstream>
+#include <string_view>
 #include <sys/stat.h>
 #include <sys/wait.h>
 
@@ -19,10 +22,11 @@ namespace ZOA::fuzz {
 
 namespace {
 
-const char* cTypeName(DataType t) {
-    static const char* const n[] = {"unsigned char", "unsigned int", "uint64", "char", "int",
-                                    "int64", "float", "double", "char *", "void"};
-    return static_cast<unsigned>(t) < 10 ? n[t] : "void";
+// The C emitter's name of t, without its separating blank.
+std::string cTypeName(DataType t) {
+    std::string_view n = ctext::typeName(t);
+    while (!n.empty() && n.back() == ' ') n.remove_suffix(1);
+    return n.empty() ? "void" : std::string(n);
 }
 const char* printfFormat(DataType t) {
     static const char* const f[] = {"%d", "%u", "%llu", "%d", "%d", "%lld", "%.9g", "%.17g", "ptr", "void"};
@@ -101,8 +105,8 @@ bool prepareUnit(ZOA_file& unit, const std::vector<Entry>& entries, Prepared& p,
 
 std::string argText(DataType t, long long v) {
     char buf[64];
-    if (t == FLOAT || t == DOUBLE) std::snprintf(buf, sizeof buf, "(%s)%lld", cTypeName(t), v);
-    else std::snprintf(buf, sizeof buf, "(%s)0x%llxULL", cTypeName(t), static_cast<unsigned long long>(v));
+    if (t == FLOAT || t == DOUBLE) std::snprintf(buf, sizeof buf, "(%s)%lld", cTypeName(t).c_str(), v);
+    else std::snprintf(buf, sizeof buf, "(%s)0x%llxULL", cTypeName(t).c_str(), static_cast<unsigned long long>(v));
     return buf;
 }
 
@@ -198,8 +202,8 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
         for (unsigned k = 0; k < p->fileNames; ++k) units_c += "#undef ng" + std::to_string(k) + "\n";
         std::string declared;
         for (const Call& c : p->calls) {
-            std::string proto = std::string(cTypeName(c.result)) + " " + c.name + "(";
-            for (std::size_t i = 0; i < c.params.size(); ++i) proto += (i ? ", " : "") + std::string(cTypeName(c.params[i]));
+            std::string proto = cTypeName(c.result) + " " + c.name + "(";
+            for (std::size_t i = 0; i < c.params.size(); ++i) proto += (i ? ", " : "") + cTypeName(c.params[i]);
             proto += ");\n";
             if (declared.find(proto) == std::string::npos) declared += proto;
             std::string call = c.name + "(";
