@@ -2,6 +2,7 @@
 #include "fuzz/campaign.h"
 #include "fuzz/quiet_stdout.h"
 
+#include "core/type_facts.h"
 #include "emit/c/c_texts.h"
 
 #include <zoa/interp.h>
@@ -29,8 +30,8 @@ std::string cTypeName(DataType t) {
     return n.empty() ? "void" : std::string(n);
 }
 const char* printfFormat(DataType t) {
-    static const char* const f[] = {"%d", "%u", "%llu", "%d", "%d", "%lld", "%.9g", "%.17g", "ptr", "void"};
-    return static_cast<unsigned>(t) < 10 ? f[t] : "void";
+    static const char* const f[DATA_TYPE_COUNT] = {"%d", "%u", "%llu", "%d", "%d", "%lld", "%.9g", "%.17g", "ptr", "void"};
+    return static_cast<unsigned>(t) < DATA_TYPE_COUNT ? f[t] : "void";
 }
 
 struct Call {
@@ -53,7 +54,7 @@ struct Prepared {
 };
 
 interp::Value argValue(DataType t, long long v) {
-    return t == FLOAT || t == DOUBLE ? interp::Value::floating(t, static_cast<double>(v)) : interp::Value::integer(t, v);
+    return isFloatingType(t) ? interp::Value::floating(t, static_cast<double>(v)) : interp::Value::integer(t, v);
 }
 
 // Interprets every entry; calls that stop are left out, and the machine is
@@ -105,7 +106,7 @@ bool prepareUnit(ZOA_file& unit, const std::vector<Entry>& entries, Prepared& p,
 
 std::string argText(DataType t, long long v) {
     char buf[64];
-    if (t == FLOAT || t == DOUBLE) std::snprintf(buf, sizeof buf, "(%s)%lld", cTypeName(t).c_str(), v);
+    if (isFloatingType(t)) std::snprintf(buf, sizeof buf, "(%s)%lld", cTypeName(t).c_str(), v);
     else std::snprintf(buf, sizeof buf, "(%s)0x%llxULL", cTypeName(t).c_str(), static_cast<unsigned long long>(v));
     return buf;
 }
@@ -214,7 +215,7 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
                 body += "    " + call + "; puts(\"" + label + "void\");\n";
             else
                 body += "    printf(\"" + label + printfFormat(c.result) + "\\n\", " +
-                        (c.result == CHAR_S || c.result == CHAR_U ? "(int)" : c.result == FLOAT ? "(double)" : "") +
+                        (isByteType(c.result) ? "(int)" : c.result == FLOAT ? "(double)" : "") +
                         call + ");\n";
             expected += c.line + "\n";
         }

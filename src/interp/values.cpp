@@ -46,9 +46,9 @@ std::string ctypeName(CType t) {
 }
 
 CType ctypeOf(DataType t) {
-    static const CType m[] = {CType::UCHAR, CType::UINT, CType::ULLONG, CType::SCHAR, CType::INT,
-                              CType::LLONG, CType::FLOAT, CType::DOUBLE, CType::POINTER, CType::VOID};
-    return static_cast<unsigned>(t) < 10 ? m[t] : CType::VOID;
+    static const CType m[DATA_TYPE_COUNT] = {CType::UCHAR, CType::UINT,  CType::ULLONG, CType::SCHAR,   CType::INT,
+                                             CType::LLONG, CType::FLOAT, CType::DOUBLE, CType::POINTER, CType::VOID};
+    return static_cast<unsigned>(t) < DATA_TYPE_COUNT ? m[t] : CType::VOID;
 }
 
 Value Value::of(CType t, std::uint64_t b) {
