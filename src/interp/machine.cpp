@@ -12,28 +12,14 @@
 namespace ZOA::interp {
 
 // ---- code addresses
-std::uint32_t Machine::Impl::codeAddress() {
+template <class Key> std::uint32_t Machine::Impl::addressIn(CodeMap<Key>& m, const Key& k) {
+    auto it = m.address.find(k);
+    if (it != m.address.end()) return it->second;
     if (nextCode >= 0xFFFFFFF0u) stop(Status::BAD_ADDRESS, "too many code addresses");
     std::uint32_t a = nextCode;
     nextCode += 16;
-    return a;
-}
-
-std::uint32_t Machine::Impl::addressOf(const LABEL* l) {
-    auto it = labelAddr.find(l);
-    if (it != labelAddr.end()) return it->second;
-    std::uint32_t a = codeAddress();
-    labelAddr[l] = a;
-    addrLabel[a] = l;
-    return a;
-}
-
-std::uint32_t Machine::Impl::addressOf(const std::string& function) {
-    auto it = funcAddr.find(function);
-    if (it != funcAddr.end()) return it->second;
-    std::uint32_t a = codeAddress();
-    funcAddr[function] = a;
-    addrFunc[a] = function;
+    m.address.emplace(k, a);
+    m.key.emplace(a, k);
     return a;
 }
 
@@ -225,8 +211,8 @@ Value Machine::Impl::call(CALL* c) {
     if (TEMP* fp = c->getFunctionPointer()) {
         Value f = eval(fp);
         for (ExprBase* a : c->getArgs()) args.push_back(convert(eval(a), ctypeOf(a ? a->getDataType() : VOID)));
-        auto it = addrFunc.find(static_cast<std::uint32_t>(f.bits));
-        if (it == addrFunc.end()) stop(Status::BAD_ADDRESS, "call through an address that is no function");
+        auto it = functions.key.find(static_cast<std::uint32_t>(f.bits));
+        if (it == functions.key.end()) stop(Status::BAD_ADDRESS, "call through an address that is no function");
         SUBPROG* s = findSubprog(it->second);
         if (!s) stop(Status::UNKNOWN_FUNCTION, "call of unknown function " + it->second);
         if (s->getReturnType() != c->getDataType()) stop(Status::NO_MEANING, "call through a pointer of another return type");
@@ -323,8 +309,8 @@ LABEL* Machine::Impl::exec(StmtBase* s, const LABEL* cur) {
                 return j->getTarget();
             }
             Value a = eval(j->getExpr());
-            auto it = addrLabel.find(static_cast<std::uint32_t>(a.bits));
-            if (a.type == CType::VOID || isReal(a.type) || it == addrLabel.end())
+            auto it = labels.key.find(static_cast<std::uint32_t>(a.bits));
+            if (a.type == CType::VOID || isReal(a.type) || it == labels.key.end())
                 stop(Status::BAD_ADDRESS, "computed jump to an address that is no label");
             if (!frame->trace->index.count(it->second)) stop(Status::NO_MEANING, "computed jump out of the subprogram");
             return const_cast<LABEL*>(it->second);

@@ -9,7 +9,6 @@
 #include <zoa/zoa.h>
 
 #include <cstdint>
-#include <map>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -45,10 +44,13 @@ struct Machine::Impl : Memory, Rules {
     std::uint64_t steps = 0;
     unsigned depth = 0;
     std::uint32_t nextCode = CODE_START;
-    std::unordered_map<const LABEL*, std::uint32_t> labelAddr;
-    std::unordered_map<std::uint32_t, const LABEL*> addrLabel;
-    std::map<std::string, std::uint32_t> funcAddr;
-    std::unordered_map<std::uint32_t, std::string> addrFunc;
+    // Code addresses both ways, by label and by function name.
+    template <class Key> struct CodeMap {
+        std::unordered_map<Key, std::uint32_t> address;
+        std::unordered_map<std::uint32_t, Key> key;
+    };
+    CodeMap<const LABEL*> labels;
+    CodeMap<std::string> functions;
     std::unordered_map<const SUBPROG*, Trace> traces;
     std::unordered_map<const NAME*, NameInfo> names;
     Frame* frame = nullptr;
@@ -56,9 +58,9 @@ struct Machine::Impl : Memory, Rules {
     Impl(ZOA_file& u, Options o) : Memory(o.strictC), Rules{o.strictC}, unit(u), opt(o) {}
 
     // Label and function addresses: distinct values outside the data blocks.
-    std::uint32_t codeAddress();
-    std::uint32_t addressOf(const LABEL* l);
-    std::uint32_t addressOf(const std::string& function);
+    template <class Key> std::uint32_t addressIn(CodeMap<Key>& m, const Key& k);
+    std::uint32_t addressOf(const LABEL* l) { return addressIn(labels, l); }
+    std::uint32_t addressOf(const std::string& function) { return addressIn(functions, function); }
 
     void tick() {
         if (++steps > opt.maxSteps) stop(Status::STEP_LIMIT, "step limit reached");
