@@ -479,6 +479,7 @@ void DumpDot::flushText() {
 }
 
 bool ZOA_file::dumpDot(std::ostream& os) {
+    if (!checkCurrent()) return false;
     DumpDot::Workspace workspace;
     for (SUBPROG* sp : subprogs) DumpDot dump(sp, os, &workspace, &getDiagnosticStream());
     return true;
