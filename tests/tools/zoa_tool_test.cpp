@@ -180,4 +180,18 @@ TEST(ZoaTool, VerifierWarningsAndTheExactAssembly) {
     EXPECT_NE(std::string::npos, strict.output.find("error: the assembly output cannot translate BINOP DIV [-Werror]"));
 }
 
+// The example of the conversion docs: a cast truncates even in a wider UNOP.
+TEST(ZoaTool, ACastConversionKeepsItsCastInTheInterpreterAndTheCompiledC) {
+    std::string dir = ZOA::testing::scratchDir();
+    std::string unit = ZOA::testing::writeFile(dir, "low.zoa",
+        "(unit gcc (subprog s0 \"low\" INT_S (arg t1 INT_S)\n"
+        "  (block L0 (MOVE t0 (UNOP INT_S CONV6 t1)) (JUMP L1))))\n");
+    EXPECT_EQ("164\n", runCommand(tool + " --run=low 178571428 '" + unit + "'").output);
+    std::string c = dir + "/low.c";
+    ASSERT_EQ(0, runCommand(tool + " --exact --emit=c -o '" + c + "' '" + unit + "'").status);
+    std::string driver = ZOA::testing::writeFile(dir, "main.c",
+        "#include <stdio.h>\nint low(int);\nint main(void) { printf(\"%d\\n\", low(178571428)); return 0; }\n");
+    EXPECT_EQ("164\n", ZOA::testing::buildAndRun32(dir, {c, driver}).output);
+}
+
 }  // namespace
