@@ -66,11 +66,15 @@ int run(ZOA::ZOA_file& unit, const Options& options, std::ostream& out) {
     return 0;
 }
 
-void emit(ZOA::ZOA_file& unit, const std::string& kind, std::ostream& out) {
-    if (kind == "dot") unit.dumpDot(out);
-    else if (kind == "ascii") unit.dumpAscii(out);
-    else if (kind == "text") ZOA::text::write(out, unit);
-    else unit.decompile(out);
+// False when the library refused to write (it said why on the diagnostic stream).
+bool emit(ZOA::ZOA_file& unit, const std::string& kind, std::ostream& out) {
+    if (kind == "dot") return unit.dumpDot(out);
+    if (kind == "ascii") return unit.dumpAscii(out);
+    if (kind == "text") {
+        ZOA::text::write(out, unit);
+        return true;
+    }
+    return unit.decompile(out);
 }
 
 }  // namespace
@@ -122,7 +126,7 @@ int main(int argc, char** argv) {
     if (options.exact && options.output == "-") unit.setDiagnosticStream(&out);
     int status = 0;
     if (!options.runFunc.empty()) status = run(unit, options, out);
-    else emit(unit, options.emit, out);
+    else if (!emit(unit, options.emit, out)) status = 1;
     if (!file.finish(why)) {
         reporter.fileError(outName, why);
         return 1;

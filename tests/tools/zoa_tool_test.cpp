@@ -6,6 +6,7 @@
 #include <filesystem>
 #include <fstream>
 #include <sstream>
+#include <utility>
 
 namespace {
 
@@ -87,38 +88,26 @@ TEST(ZoaTool, RunTakesEvery64BitIntegerAndRefusesWhatIsOutOfRange) {
         "  (subprog s0 \"u\" INT64_U (arg t1 INT64_U) (block L0 (MOVE t0 t1) (JUMP L1)))\n"
         "  (subprog s1 \"s\" INT64_S (arg t1 INT64_S) (block L0 (MOVE t0 t1) (JUMP L1)))\n"
         "  (subprog s2 \"d\" DOUBLE (arg t1 DOUBLE) (block L0 (MOVE t0 t1) (JUMP L1))))\n") + "'";
-    struct Case {
-        const char* args;
-        const char* printed;
-    } fine[] = {
-        {"--run=u 18446744073709551615", "18446744073709551615\n"},
-        {"--run=u 0xFFFFFFFFFFFFFFFF", "18446744073709551615\n"},
-        {"--run=s -9223372036854775808", "-9223372036854775808\n"},
-        {"--run=s 9223372036854775807", "9223372036854775807\n"},
-        {"--run s -- -0x10", "-16\n"},
-        {"--run=s 010", "10\n"},  // decimal, as the text form reads it
-        {"--run=d 2.5", "2.5\n"},
-    };
-    for (const Case& c : fine) {
-        CommandResult r = runCommand(tool + " " + c.args + " " + unit);
-        EXPECT_EQ(0, r.status) << c.args << ": " << r.output;
-        EXPECT_EQ(c.printed, r.output) << c.args;
+    // Each run's arguments and what it prints, whole (a result) or in part (a refusal).
+    using Expected = std::pair<const char*, const char*>;
+    for (const Expected& e : {Expected{"--run=u 18446744073709551615", "18446744073709551615\n"},
+                              Expected{"--run=u 0xFFFFFFFFFFFFFFFF", "18446744073709551615\n"},
+                              Expected{"--run=s -9223372036854775808", "-9223372036854775808\n"},
+                              Expected{"--run=s 9223372036854775807", "9223372036854775807\n"},
+                              Expected{"--run s -- -0x10", "-16\n"},
+                              Expected{"--run=s 010", "10\n"},  // decimal, as the text form reads it
+                              Expected{"--run=d 2.5", "2.5\n"}}) {
+        CommandResult r = runCommand(tool + " " + e.first + " " + unit);
+        EXPECT_EQ(0, r.status) << e.first << ": " << r.output;
+        EXPECT_EQ(e.second, r.output) << e.first;
     }
-    struct Bad {
-        const char* arg;
-        const char* why;
-    } bad[] = {
-        {"18446744073709551616", "is out of range"},
-        {"-9223372036854775809", "is out of range"},
-        {"0x10000000000000000", "is out of range"},
-        {"1e999", "is out of range"},
-        {"12abc", "is no number"},
-        {"' 5'", "is no number"},
-    };
-    for (const Bad& b : bad) {
-        CommandResult r = runCommand(tool + " --run=s " + b.arg + " " + unit);
-        EXPECT_EQ(2, r.status) << b.arg;
-        EXPECT_NE(std::string::npos, r.output.find(b.why)) << b.arg << ": " << r.output;
+    for (const Expected& e : {Expected{"18446744073709551616", "is out of range"},
+                              Expected{"-9223372036854775809", "is out of range"},
+                              Expected{"0x10000000000000000", "is out of range"}, Expected{"1e999", "is out of range"},
+                              Expected{"12abc", "is no number"}, Expected{"' 5'", "is no number"}}) {
+        CommandResult r = runCommand(tool + " --run=s " + e.first + " " + unit);
+        EXPECT_EQ(2, r.status) << e.first;
+        EXPECT_NE(std::string::npos, r.output.find(e.second)) << e.first << ": " << r.output;
     }
 }
 
