@@ -2,7 +2,7 @@
 # (find_package(ZOA CONFIG) gives ZOA::zoa) and a pkg-config file.
 include(CMakePackageConfigHelpers)
 
-install(TARGETS zoa zoa_text zoa_interp EXPORT ZOATargets
+install(TARGETS zoa zoa_verify zoa_text zoa_interp EXPORT ZOATargets
   LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
   ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR}
   RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR}

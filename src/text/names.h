@@ -21,11 +21,20 @@ bool lookupTempState(std::string_view s, TempState& out);
 // A node kind by the head the text form writes for it ("MOVE", "BINOP", ...).
 bool lookupNodeKind(std::string_view s, NodeType& out);
 
-// The printed name of an enumerator, or its number when it has none.
-template <class E> std::string spell(E v) {
-    const char* s = toString(v);
-    return s[0] == '?' ? std::to_string(static_cast<int>(v)) : std::string(s);
-}
+// The printed name of an enumerator; empty when it has none.
+std::string_view printedName(DataType v);
+std::string_view printedName(BinopKind v);
+std::string_view printedName(UnopKind v);
+std::string_view printedName(NameKind v);
+std::string_view printedName(LabelKind v);
+std::string_view printedName(TempState v);
+
+// How the writer spells an enumerator: its printed name, or its number when it has none.
+struct Spelling {
+    std::string_view name;
+    int number;
+};
+template <class E> Spelling spell(E v) { return {printedName(v), static_cast<int>(v)}; }
 
 }  // namespace ZOA::text
 

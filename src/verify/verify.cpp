@@ -2,11 +2,56 @@
 #include <zoa/verify.h>
 #include <zoa/zoa.h>
 
-#include <unordered_set>
+#include "core/children.h"
+#include "core/op_facts.h"
+
+#include <cstdint>
+#include <unordered_map>
 
 namespace ZOA::verify {
 
 namespace {
+
+// A set of node identities: open addressing over a power-of-two table kept at
+// most half full, so marking a node is a hash and a probe or two, with no
+// allocation per node.
+class NodeMarks {
+public:
+    // True if p was not in the set.
+    bool insert(const void* p) {
+        if ((count + 1) * 2 > slots.size()) grow();
+        std::size_t i = probe(p);
+        if (slots[i]) return false;
+        slots[i] = p;
+        ++count;
+        return true;
+    }
+    bool contains(const void* p) const { return count && slots[probe(p)]; }
+    void clear() {
+        if (count) slots.assign(slots.size(), nullptr);
+        count = 0;
+    }
+
+private:
+    std::vector<const void*> slots;
+    std::size_t count = 0;
+
+    std::size_t probe(const void* p) const {
+        std::uint64_t h = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(p));
+        h ^= h >> 33;
+        h *= 0xff51afd7ed558ccdULL;
+        h ^= h >> 33;
+        std::size_t mask = slots.size() - 1, i = static_cast<std::size_t>(h) & mask;
+        while (slots[i] && slots[i] != p) i = (i + 1) & mask;
+        return i;
+    }
+    void grow() {
+        std::vector<const void*> old(slots.size() < 64 ? 64 : slots.size() * 2, nullptr);
+        old.swap(slots);
+        for (const void* p : old)
+            if (p) slots[probe(p)] = p;
+    }
+};
 
 bool isTemp(TreeBase* t) { return t->getNodeType() == TEMP_NODE || t->getNodeType() == BUF_TEMP_NODE; }
 std::string quoted(const String& s) { return "'" + std::string(s.data(), s.size()) + "'"; }
@@ -23,18 +68,17 @@ private:
     bool asmMode;
     ZOA_file* unit;
     SUBPROG* sp = nullptr;
-    std::unordered_set<TreeBase*> seen;
-    std::unordered_set<const TEMP*> ownTemps;
+    NodeMarks seen;
+    NodeMarks ownTemps;
+    std::unordered_map<const TEMP*, SUBPROG*> owners;  // filled at the first foreign temporary
     std::vector<TreeBase*> todo;
 
     void report(Severity s, TreeBase* n, std::string msg) { out.push_back({s, n, sp, std::move(msg)}); }
     void error(TreeBase* n, std::string msg) { report(Severity::ERROR, n, std::move(msg)); }
 
+    // Reports a missing child; the children present are walked by forEachChild.
     void child(TreeBase* parent, TreeBase* c, const char* what) {
-        if (!c)
-            error(parent, std::string(toString(parent->getNodeType())) + " has no " + what);
-        else
-            todo.push_back(c);
+        if (!c) error(parent, std::string(toString(parent->getNodeType())) + " has no " + what);
     }
     void target(TreeBase* parent, LABEL* l, const char* what) {
         if (!l) {
@@ -80,15 +124,16 @@ void Checker::name(NAME* n) {
 }
 
 void Checker::temp(TEMP* t) {
-    if (!sp || ownTemps.count(t)) return;
-    if (unit)
+    if (!sp || ownTemps.contains(t)) return;
+    if (unit && owners.empty())
         for (SUBPROG* other : unit->getSubprogs())
-            for (TEMP* o : other->getAllTemps())
-                if (o == t) {
-                    error(t, "temporary t" + std::to_string(t->getId()) + " of " + quoted(other->getName()) +
-                                 " is used in " + quoted(sp->getName()));
-                    return;
-                }
+            for (TEMP* o : other->getAllTemps()) owners.emplace(o, other);
+    auto it = owners.find(t);
+    if (it != owners.end()) {
+        error(t, "temporary t" + std::to_string(t->getId()) + " of " + quoted(it->second->getName()) +
+                     " is used in " + quoted(sp->getName()));
+        return;
+    }
     report(Severity::WARNING, t, "temporary t" + std::to_string(t->getId()) + " was not made by " + quoted(sp->getName()));
 }
 
@@ -102,7 +147,7 @@ void Checker::node(TreeBase* t) {
         case BINOP_NODE: {
             BINOP* b = static_cast<BINOP*>(t);
             BinopKind op = b->getOp();
-            if (asmMode && op != PLUS && op != MINUS && op != MUL && (op < EQ || op > GE))
+            if (asmMode && op != PLUS && op != MINUS && op != MUL && !isRelation(op))
                 report(Severity::WARNING, t, std::string("the assembly output cannot translate BINOP ") + toString(op));
             child(t, b->getLeft(), "left operand");
             child(t, b->getRight(), "right operand");
@@ -120,14 +165,16 @@ void Checker::node(TreeBase* t) {
             CALL* c = static_cast<CALL*>(t);
             if (c->getFunctionName().empty() && !c->getFunctionPointer())
                 error(t, "CALL has neither a function name nor a function pointer");
-            if (c->getFunctionPointer()) todo.push_back(c->getFunctionPointer());
             for (ExprBase* a : c->getArgs()) child(t, a, "argument");
             break;
         }
         case NAME_NODE: {
             NAME* n = static_cast<NAME*>(t);
-            if (n->getKind() == LABEL_REF && n->getLabelRef() && sp) target(n, n->getLabelRef(), "label");
-            else name(n);
+            if (n->getKind() == LABEL_REF && n->getLabelRef() && sp) {
+                target(n, n->getLabelRef(), "label");
+                return;  // its address is all a label name stands for
+            }
+            name(n);
             break;
         }
         case TEMP_NODE:
@@ -142,10 +189,7 @@ void Checker::node(TreeBase* t) {
             child(t, m->getSrc(), "source");
             break;
         }
-        case SEQ_NODE:
-            if (StmtBase* l = static_cast<SEQ*>(t)->getLeft()) todo.push_back(l);
-            if (StmtBase* r = static_cast<SEQ*>(t)->getRight()) todo.push_back(r);
-            break;
+        case SEQ_NODE: break;  // either side may be null
         case JUMP_NODE: {
             JUMP* j = static_cast<JUMP*>(t);
             if (j->getKind() == DIRECT_LABEL) {
@@ -159,7 +203,7 @@ void Checker::node(TreeBase* t) {
         }
         case CJUMP_NODE: {
             CJUMP* c = static_cast<CJUMP*>(t);
-            if (c->getRelOp() < EQ || c->getRelOp() > GE)
+            if (!isRelation(c->getRelOp()))
                 error(t, std::string("CJUMP relation ") + toString(c->getRelOp()) + " is not one of EQ, NE, LT, LE, GT, GE");
             child(t, c->getLeft(), "left operand");
             child(t, c->getRight(), "right operand");
@@ -175,6 +219,7 @@ void Checker::node(TreeBase* t) {
         case SUBPROG_NODE:
             break;
     }
+    forEachChild(t, [this](TreeBase* c) { todo.push_back(c); });
 }
 
 void Checker::walk(TreeBase* root) {
@@ -182,7 +227,7 @@ void Checker::walk(TreeBase* root) {
     while (!todo.empty()) {
         TreeBase* t = todo.back();
         todo.pop_back();
-        if (seen.insert(t).second) node(t);
+        if (seen.insert(t)) node(t);
     }
 }
 
