@@ -70,8 +70,9 @@ private:
 };
 
 // What parse gives back: the unit it built, or the diagnostics that stopped it.
-// The unit was constructed (so the arena was rewound) whenever the text got as
-// far as its (unit ...) form; on failure it is dropped again. Texts of POINTER
+// The reader builds while it reads, so the unit was constructed (and the arena
+// rewound) whenever the (unit ...) form got past its flavour, even if the text
+// fails further on; on failure it is dropped again. Texts of POINTER
 // constants are copied into the arena, so they live exactly as long as the nodes.
 class Result {
 public:
@@ -116,7 +117,9 @@ Result parse(std::string_view source, const std::string& fileName, const Flavour
 // Writes the unit in the text form. Shared subtrees are written once per use
 // (reading them back gives separate but equal nodes); shared leaves (temps,
 // names, labels) are written as references and stay shared. Writing a unit,
-// reading it back and writing that gives the same bytes.
+// reading it back and writing that gives the same bytes. A tree that contains
+// itself (made through copy assignment) is written up to the repetition, then
+// "(cycle)", which the reader refuses.
 void write(std::ostream& os, const ZOA_file& unit);
 std::string write(const ZOA_file& unit);
 
