@@ -5,6 +5,7 @@
 #include <zoa/zoa.h>
 
 #include "core/children.h"
+#include "core/node_kinds.h"
 
 #include <algorithm>
 #include <charconv>
@@ -27,6 +28,12 @@ struct Owner {
     unsigned int id;
 };
 
+// "(KIND ": a node's head, named as the list of node kinds names it.
+struct Head {
+    NodeType kind;
+};
+Head head(NodeType k) { return {k}; }
+
 // The text gathered in a buffer and handed to the stream a large piece at a
 // time, or appended straight to a string; numbers in plain decimal, whatever
 // the stream's flags.
@@ -45,6 +52,7 @@ public:
     }
     Out& operator<<(const char* s) { return *this << std::string_view(s); }
     Out& operator<<(const std::string& s) { return *this << std::string_view(s); }
+    Out& operator<<(Head h) { return *this << '(' << nodeKindName(h.kind) << ' '; }
     Out& operator<<(const Spelling& s) { return s.name.empty() ? *this << s.number : *this << s.name; }
     Out& operator<<(char c) {
         buf.push_back(c);
@@ -264,7 +272,7 @@ void Writer::collectDead(std::size_t i, TreeBase* t) {
 
 void Writer::constant(CONST* c) {
     DataType t = c->getDataType();
-    os << "(CONST " << spell(t) << ' ';
+    os << head(CONST_NODE) << spell(t) << ' ';
     char buf[64];
     if (t == FLOAT || t == DOUBLE) {
         double v = c->getFValue();
@@ -312,7 +320,7 @@ void Writer::exprBody(ExprBase* e, int ctx) {
         case CONST_NODE: constant(static_cast<CONST*>(e)); return;
         case BINOP_NODE: {
             BINOP* b = static_cast<BINOP*>(e);
-            os << "(BINOP " << spell(b->getDataType()) << ' ' << spell(b->getOp()) << ' ';
+            os << head(BINOP_NODE) << spell(b->getDataType()) << ' ' << spell(b->getOp()) << ' ';
             expr(b->getLeft(), ctx);
             os << ' ';
             expr(b->getRight(), ctx);
@@ -321,19 +329,19 @@ void Writer::exprBody(ExprBase* e, int ctx) {
         }
         case UNOP_NODE: {
             UNOP* u = static_cast<UNOP*>(e);
-            os << "(UNOP " << spell(u->getDataType()) << ' ' << spell(u->getOp()) << ' ';
+            os << head(UNOP_NODE) << spell(u->getDataType()) << ' ' << spell(u->getOp()) << ' ';
             expr(u->getExpr(), ctx);
             os << ')';
             return;
         }
         case MEM_NODE:
-            os << "(MEM " << spell(e->getDataType()) << ' ';
+            os << head(MEM_NODE) << spell(e->getDataType()) << ' ';
             expr(static_cast<MEM*>(e)->getExpr(), ctx);
             os << ')';
             return;
         case CALL_NODE: {
             CALL* c = static_cast<CALL*>(e);
-            os << "(CALL " << spell(c->getDataType()) << ' ';
+            os << head(CALL_NODE) << spell(c->getDataType()) << ' ';
             if (c->getFunctionPointer())
                 expr(c->getFunctionPointer(), ctx);
             else
@@ -352,7 +360,7 @@ void Writer::exprBody(ExprBase* e, int ctx) {
             if (ownerOf(n, ctx, o)) {
                 ref(o.sub == GLOBAL ? 'g' : 'n', o, ctx);
             } else if (n->getLabelRef()) {
-                os << "(NAME ";
+                os << head(NAME_NODE);
                 label(n->getLabelRef(), ctx);
                 os << (n->isDeclaredLocal() ? " local)" : ")");
             } else {
@@ -367,7 +375,7 @@ void Writer::exprBody(ExprBase* e, int ctx) {
             if (ownerOf(t, ctx, o))
                 ref('t', o, ctx);
             else if (e->getNodeType() == BUF_TEMP_NODE)
-                os << "(BUF_TEMP " << t->getId() << ' ' << static_cast<BUF_TEMP*>(t)->getArraySize() << ')';
+                os << head(BUF_TEMP_NODE) << t->getId() << ' ' << static_cast<BUF_TEMP*>(t)->getArraySize() << ')';
             else
                 os << "(unknown-temp " << t->getId() << ')';
             return;
@@ -404,19 +412,19 @@ void Writer::stmt(StmtBase* s, int ctx, int depth) {
 void Writer::stmtBody(StmtBase* s, int ctx, int depth) {
     switch (s->getNodeType()) {
         case MOVE_NODE:
-            os << "(MOVE ";
+            os << head(MOVE_NODE);
             expr(static_cast<MOVE*>(s)->getDst(), ctx);
             os << ' ';
             expr(static_cast<MOVE*>(s)->getSrc(), ctx);
             os << ')';
             return;
         case EXP_NODE:
-            os << "(EXP ";
+            os << head(EXP_NODE);
             expr(static_cast<EXP*>(s)->getExpr(), ctx);
             os << ')';
             return;
         case SEQ_NODE:
-            os << "(SEQ ";
+            os << head(SEQ_NODE);
             stmt(static_cast<SEQ*>(s)->getLeft(), ctx, depth + 1);
             os << ' ';
             stmt(static_cast<SEQ*>(s)->getRight(), ctx, depth + 1);
@@ -424,7 +432,7 @@ void Writer::stmtBody(StmtBase* s, int ctx, int depth) {
             return;
         case JUMP_NODE: {
             JUMP* j = static_cast<JUMP*>(s);
-            os << "(JUMP ";
+            os << head(JUMP_NODE);
             if (j->getKind() == DIRECT_LABEL) {
                 // An unknown target is written as nil too: keep the kind explicit.
                 Owner o;
@@ -439,7 +447,7 @@ void Writer::stmtBody(StmtBase* s, int ctx, int depth) {
         }
         case CJUMP_NODE: {
             CJUMP* c = static_cast<CJUMP*>(s);
-            os << "(CJUMP " << spell(c->getRelOp()) << ' ';
+            os << head(CJUMP_NODE) << spell(c->getRelOp()) << ' ';
             expr(c->getLeft(), ctx);
             os << ' ';
             expr(c->getRight(), ctx);
