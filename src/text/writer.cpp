@@ -136,40 +136,34 @@ private:
         if (id >= v.size()) v.resize(static_cast<std::size_t>(id) + 1, nullptr);
         v[id] = x;
     }
-    template <class T> static bool owns(const std::vector<const T*>& v, unsigned int id, const T* x) {
-        return id < v.size() && v[id] == x;
-    }
     // The owner of a temp, label or name; false for one the unit does not hold.
-    bool ownerOf(const TEMP* t, int ctx, Owner& o) const {
-        if (ctx >= 0 && owns(own[static_cast<std::size_t>(ctx)].temps, t->getId(), t)) {
-            o = {ctx, t->getId()};
+    // Looks in subprogram ctx's own ones by id (and, for names, the file-level
+    // ones) before the map.
+    template <class T>
+    static bool find(const T* x, int ctx, const std::vector<const T*>* mine, const std::vector<const T*>* global,
+                     const std::unordered_map<const T*, Owner>& map, Owner& o) {
+        unsigned int id = x->getId();
+        if (global && id < global->size() && (*global)[id] == x) {
+            o = {GLOBAL, id};
             return true;
         }
-        auto it = temps.find(t);
-        if (it != temps.end()) o = it->second;
-        return it != temps.end();
+        if (mine && id < mine->size() && (*mine)[id] == x) {
+            o = {ctx, id};
+            return true;
+        }
+        auto it = map.find(x);
+        if (it != map.end()) o = it->second;
+        return it != map.end();
+    }
+    const Own* mine(int ctx) const { return ctx >= 0 ? &own[static_cast<std::size_t>(ctx)] : nullptr; }
+    bool ownerOf(const TEMP* t, int ctx, Owner& o) const {
+        return find<TEMP>(t, ctx, ctx >= 0 ? &mine(ctx)->temps : nullptr, nullptr, temps, o);
     }
     bool ownerOf(const LABEL* l, int ctx, Owner& o) const {
-        if (ctx >= 0 && owns(own[static_cast<std::size_t>(ctx)].labels, l->getId(), l)) {
-            o = {ctx, l->getId()};
-            return true;
-        }
-        auto it = labels.find(l);
-        if (it != labels.end()) o = it->second;
-        return it != labels.end();
+        return find<LABEL>(l, ctx, ctx >= 0 ? &mine(ctx)->labels : nullptr, nullptr, labels, o);
     }
     bool ownerOf(const NAME* n, int ctx, Owner& o) const {
-        if (owns(globalNames, n->getId(), n)) {
-            o = {GLOBAL, n->getId()};
-            return true;
-        }
-        if (ctx >= 0 && owns(own[static_cast<std::size_t>(ctx)].names, n->getId(), n)) {
-            o = {ctx, n->getId()};
-            return true;
-        }
-        auto it = names.find(n);
-        if (it != names.end()) o = it->second;
-        return it != names.end();
+        return find<NAME>(n, ctx, ctx >= 0 ? &mine(ctx)->names : nullptr, &globalNames, names, o);
     }
 
     // True if n is already being written further out: a tree that contains
