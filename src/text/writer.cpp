@@ -1,5 +1,6 @@
 // Text writer: prints a unit in the form the reader rebuilds it from, ids and order preserved.
 #include "text/names.h"
+#include "text/write_buffer.h"
 
 #include <zoa/text.h>
 #include <zoa/zoa.h>
@@ -21,84 +22,16 @@ namespace ZOA::text {
 
 namespace {
 
+using detail::head;
+using detail::Out;
+using detail::writeText;
+
 constexpr int GLOBAL = -1;
 
 struct Owner {
     int sub;  // GLOBAL for file-level names
     unsigned int id;
 };
-
-// "(KIND ": a node's head, named as the list of node kinds names it.
-struct Head {
-    NodeType kind;
-};
-Head head(NodeType k) { return {k}; }
-
-// The text gathered in a buffer and handed to the stream a large piece at a
-// time, or appended straight to a string; numbers in plain decimal, whatever
-// the stream's flags.
-class Out {
-public:
-    explicit Out(std::ostream& os) : os(&os), buf(local) { local.reserve(CAPACITY + 64); }
-    explicit Out(std::string& into) : buf(into) {}
-    ~Out() { flush(); }
-    Out(const Out&) = delete;
-    Out& operator=(const Out&) = delete;
-
-    Out& operator<<(std::string_view s) {
-        buf.append(s.data(), s.size());
-        if (os && buf.size() >= CAPACITY) flush();
-        return *this;
-    }
-    Out& operator<<(const char* s) { return *this << std::string_view(s); }
-    Out& operator<<(const std::string& s) { return *this << std::string_view(s); }
-    Out& operator<<(Head h) { return *this << '(' << nodeKindName(h.kind) << ' '; }
-    Out& operator<<(const Spelling& s) { return s.name.empty() ? *this << s.number : *this << s.name; }
-    Out& operator<<(char c) {
-        buf.push_back(c);
-        return *this;
-    }
-    template <class T, std::enable_if_t<std::is_integral_v<T> && !std::is_same_v<T, char> && !std::is_same_v<T, bool>, int> = 0>
-    Out& operator<<(T v) {
-        char tmp[24];
-        auto r = std::to_chars(tmp, tmp + sizeof tmp, v);
-        return *this << std::string_view(tmp, static_cast<std::size_t>(r.ptr - tmp));
-    }
-    void flush() {
-        if (!os) return;
-        os->write(buf.data(), static_cast<std::streamsize>(buf.size()));
-        buf.clear();
-    }
-
-private:
-    static constexpr std::size_t CAPACITY = 32 * 1024;
-    std::ostream* os = nullptr;
-    std::string local;
-    std::string& buf;
-};
-
-void writeText(Out& os, const char* s, std::size_t n) {
-    os << '"';
-    for (std::size_t i = 0; i < n; ++i) {
-        unsigned char c = static_cast<unsigned char>(s[i]);
-        switch (c) {
-            case '"': os << "\\\""; break;
-            case '\\': os << "\\\\"; break;
-            case '\n': os << "\\n"; break;
-            case '\t': os << "\\t"; break;
-            case '\r': os << "\\r"; break;
-            default:
-                if (c < 0x20 || c >= 0x7f) {
-                    char buf[8];
-                    std::snprintf(buf, sizeof buf, "\\x%02x", c);
-                    os << buf;
-                } else {
-                    os << static_cast<char>(c);
-                }
-        }
-    }
-    os << '"';
-}
 
 class Writer {
 public:
