@@ -4,54 +4,13 @@
 
 #include "core/children.h"
 #include "core/op_facts.h"
+#include "support/pointer_table.h"
 
-#include <cstdint>
 #include <unordered_map>
 
 namespace ZOA::verify {
 
 namespace {
-
-// A set of node identities: open addressing over a power-of-two table kept at
-// most half full, so marking a node is a hash and a probe or two, with no
-// allocation per node.
-class NodeMarks {
-public:
-    // True if p was not in the set.
-    bool insert(const void* p) {
-        if ((count + 1) * 2 > slots.size()) grow();
-        std::size_t i = probe(p);
-        if (slots[i]) return false;
-        slots[i] = p;
-        ++count;
-        return true;
-    }
-    bool contains(const void* p) const { return count && slots[probe(p)]; }
-    void clear() {
-        if (count) slots.assign(slots.size(), nullptr);
-        count = 0;
-    }
-
-private:
-    std::vector<const void*> slots;
-    std::size_t count = 0;
-
-    std::size_t probe(const void* p) const {
-        std::uint64_t h = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(p));
-        h ^= h >> 33;
-        h *= 0xff51afd7ed558ccdULL;
-        h ^= h >> 33;
-        std::size_t mask = slots.size() - 1, i = static_cast<std::size_t>(h) & mask;
-        while (slots[i] && slots[i] != p) i = (i + 1) & mask;
-        return i;
-    }
-    void grow() {
-        std::vector<const void*> old(slots.size() < 64 ? 64 : slots.size() * 2, nullptr);
-        old.swap(slots);
-        for (const void* p : old)
-            if (p) slots[probe(p)] = p;
-    }
-};
 
 bool isTemp(TreeBase* t) { return t->getNodeType() == TEMP_NODE || t->getNodeType() == BUF_TEMP_NODE; }
 std::string quoted(const String& s) { return "'" + std::string(s.data(), s.size()) + "'"; }
@@ -68,8 +27,8 @@ private:
     bool asmMode;
     ZOA_file* unit;
     SUBPROG* sp = nullptr;
-    NodeMarks seen;
-    NodeMarks ownTemps;
+    PointerSet<const TreeBase*> seen;
+    PointerSet<const TEMP*> ownTemps;
     std::unordered_map<const TEMP*, SUBPROG*> owners;  // filled at the first foreign temporary
     std::vector<TreeBase*> todo;
 
