@@ -3,7 +3,7 @@
 # ZOA::interp) and pkg-config files (zoa, zoa-text, zoa-interp).
 include(CMakePackageConfigHelpers)
 
-install(TARGETS zoa zoa_text zoa_interp EXPORT ZOATargets
+install(TARGETS zoa zoa_verify zoa_text zoa_interp EXPORT ZOATargets
   LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
   ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR}
   RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR}
@@ -19,7 +19,8 @@ install(FILES ${PROJECT_BINARY_DIR}/ZOAConfig.cmake ${PROJECT_BINARY_DIR}/ZOACon
   DESTINATION ${ZOA_CMAKE_DIR})
 
 # pkg-config: one file per library, as with other multi-library packages;
-# zoa-text and zoa-interp require zoa, so their link lines end in -lZOA.
+# zoa-verify and zoa-interp require zoa, zoa-text requires zoa-verify, so
+# every link line ends in -lZOA.
 # The Cflags carry no -std: the headers need C++17, which is what g++ 11 and
 # clang 16 and later compile by default, and a forced -std=c++17 would lower a
 # user's -std=c++20. (The CMake targets state cxx_std_17 as a minimum instead.)
@@ -27,15 +28,20 @@ install(FILES ${PROJECT_BINARY_DIR}/ZOAConfig.cmake ${PROJECT_BINARY_DIR}/ZOACon
 file(RELATIVE_PATH ZOA_PC_TO_PREFIX /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
 string(REGEX REPLACE "/$" "" ZOA_PC_TO_PREFIX "${ZOA_PC_TO_PREFIX}")
 configure_file(${PROJECT_SOURCE_DIR}/cmake/zoa.pc.in ${PROJECT_BINARY_DIR}/pkgconfig/zoa.pc @ONLY)
-foreach(part text interp)
+foreach(part verify text interp)
   set(ZOA_PC_PART ${part})
   set(ZOA_PC_LIB ZOA_${part})
+  set(ZOA_PC_REQUIRES "zoa = ${PROJECT_VERSION}")
   if(part STREQUAL "text")
-    set(ZOA_PC_DESCRIPTION "libZOA's text form (zoa/text.h) and verifier (zoa/verify.h)")
+    set(ZOA_PC_DESCRIPTION "libZOA's text form (zoa/text.h), with the verifier")
+    set(ZOA_PC_REQUIRES "zoa-verify = ${PROJECT_VERSION}")
+  elseif(part STREQUAL "verify")
+    set(ZOA_PC_DESCRIPTION "libZOA's verifier (zoa/verify.h)")
   else()
     set(ZOA_PC_DESCRIPTION "libZOA's interpreter (zoa/interp.h)")
   endif()
   configure_file(${PROJECT_SOURCE_DIR}/cmake/zoa-lib.pc.in ${PROJECT_BINARY_DIR}/pkgconfig/zoa-${part}.pc @ONLY)
 endforeach()
-install(FILES ${PROJECT_BINARY_DIR}/pkgconfig/zoa.pc ${PROJECT_BINARY_DIR}/pkgconfig/zoa-text.pc
+install(FILES ${PROJECT_BINARY_DIR}/pkgconfig/zoa.pc ${PROJECT_BINARY_DIR}/pkgconfig/zoa-verify.pc
+  ${PROJECT_BINARY_DIR}/pkgconfig/zoa-text.pc
   ${PROJECT_BINARY_DIR}/pkgconfig/zoa-interp.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)

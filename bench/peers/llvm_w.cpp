@@ -1,5 +1,6 @@
 // Workload W through LLVM 14's IRBuilder, printed with Module::print.
 #include "peers.h"
+#include "llvm_w.h"
 
 #include <llvm/IR/IRBuilder.h>
 #include <llvm/IR/LLVMContext.h>
@@ -12,10 +13,7 @@
 namespace ZOA::bench {
 
 // SSA has no reusable temporaries: each statement's value is the next u.
-PhaseTimes runLlvm(const Shape& shape) {
-    PhaseTimes times;
-    llvm::LLVMContext ctx;
-    double t0 = nowNs();
+std::unique_ptr<llvm::Module> buildLlvmW(llvm::LLVMContext& ctx, const Shape& shape) {
     auto module = std::make_unique<llvm::Module>("w", ctx);
     llvm::IRBuilder<> ir(ctx);
     llvm::Type* i32 = ir.getInt32Ty();
@@ -43,6 +41,14 @@ PhaseTimes runLlvm(const Shape& shape) {
         ir.SetInsertPoint(ret);
         ir.CreateRet(a);
     }
+    return module;
+}
+
+PhaseTimes runLlvm(const Shape& shape) {
+    PhaseTimes times;
+    llvm::LLVMContext ctx;
+    double t0 = nowNs();
+    std::unique_ptr<llvm::Module> module = buildLlvmW(ctx, shape);
     double t1 = nowNs();
     static std::string text;  // reused across runs: its capacity stays
     text.clear();

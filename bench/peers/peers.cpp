@@ -15,12 +15,6 @@
 
 namespace ZOA::bench {
 
-double nowNs() {
-    return static_cast<double>(
-        std::chrono::duration_cast<std::chrono::nanoseconds>(std::chrono::steady_clock::now().time_since_epoch())
-            .count());
-}
-
 namespace {
 
 enum class ZoaOutput { C, ASCII, DOT };

@@ -4,6 +4,7 @@
 
 #include "workload.h"
 
+#include <chrono>
 #include <cstddef>
 
 namespace ZOA::bench {
@@ -20,7 +21,11 @@ PhaseTimes runLlvm(const Shape& shape);
 // libgccjit 12: the C API, then gcc_jit_context_dump_to_file.
 PhaseTimes runGccJit(const Shape& shape, const char* dumpPath);
 
-double nowNs();
+inline double nowNs() {
+    return static_cast<double>(
+        std::chrono::duration_cast<std::chrono::nanoseconds>(std::chrono::steady_clock::now().time_since_epoch())
+            .count());
+}
 
 }  // namespace ZOA::bench
 

@@ -10,7 +10,6 @@
 #include <memory>
 #include <string>
 #include <string_view>
-#include <unordered_map>
 #include <vector>
 
 namespace ZOA::text {
@@ -32,9 +31,48 @@ struct Position {
     unsigned int column = 0;
 };
 
+// Where the reader made each node, as byte offsets, and the line starts that
+// turn an offset into a line and column. A flat table in creation order; the
+// first lookup sorts it (so positionOf is not to be called from two threads at
+// once on the same Result).
+class PositionTable {
+public:
+    // Node n was made by the text at byte `offset`. Records of the declaration
+    // phase (unit items in order) count before those of the blocks, whatever
+    // order they were made in; within a phase the first record of a node wins.
+    void record(const TreeBase* n, std::size_t offset, bool inBlock) {
+        Log& log = inBlock ? late_ : early_;
+        if (log.empty() || log.back().size() == log.back().capacity()) grow(log);
+        log.back().push_back({n, offset});
+        sorted_ = false;
+    }
+    const Position* find(const TreeBase* n) const;
+    // The line and column of a byte offset.
+    Position locate(std::size_t offset) const;
+    void clear();
+    std::vector<std::size_t> lineStarts;  // offset of each line's first byte
+
+private:
+    struct Entry {
+        const TreeBase* node;
+        std::size_t offset;
+    };
+    struct Found {
+        const TreeBase* node;
+        Position position;
+    };
+    // Filled in chunks, so that a growing table is never copied.
+    using Log = std::vector<std::vector<Entry>>;
+    static void grow(Log& log);
+    Log early_, late_;
+    mutable std::vector<Found> index_;
+    mutable bool sorted_ = true;
+};
+
 // What parse gives back: the unit it built, or the diagnostics that stopped it.
-// The unit was constructed (so the arena was rewound) whenever the text got as
-// far as its (unit ...) form; on failure it is dropped again. Texts of POINTER
+// The reader builds while it reads, so the unit was constructed (and the arena
+// rewound) whenever the (unit ...) form got past its flavour, even if the text
+// fails further on; on failure it is dropped again. Texts of POINTER
 // constants are copied into the arena, so they live exactly as long as the nodes.
 class Result {
 public:
@@ -45,15 +83,12 @@ public:
     const std::vector<Diagnostic>& diagnostics() const { return diagnostics_; }
     // Where a node of the unit was written (for a temp, label or name: its
     // declaration); null for nodes the text did not make.
-    const Position* positionOf(const TreeBase* node) const {
-        auto it = positions_.find(node);
-        return it == positions_.end() ? nullptr : &it->second;
-    }
+    const Position* positionOf(const TreeBase* node) const { return positions_.find(node); }
 
     // Filled by the reader.
     std::unique_ptr<ZOA_file> unit_;
     std::vector<Diagnostic> diagnostics_;
-    std::unordered_map<const TreeBase*, Position> positions_;
+    PositionTable positions_;
 };
 
 // Overrides the flavour the text names, e.g. to write a unit written for C as
@@ -82,7 +117,9 @@ Result parse(std::string_view source, const std::string& fileName, const Flavour
 // Writes the unit in the text form. Shared subtrees are written once per use
 // (reading them back gives separate but equal nodes); shared leaves (temps,
 // names, labels) are written as references and stay shared. Writing a unit,
-// reading it back and writing that gives the same bytes.
+// reading it back and writing that gives the same bytes. A tree that contains
+// itself (made through copy assignment) is written up to the repetition, then
+// "(cycle)", which the reader refuses.
 void write(std::ostream& os, const ZOA_file& unit);
 std::string write(const ZOA_file& unit);
 

@@ -29,7 +29,8 @@ struct Diagnostic {
 // in assembly mode, what the assembly output cannot translate: BINOP operators
 // other than PLUS, MINUS, MUL and the six relations, UNOP operators other than
 // CONV4, and FLOAT or DOUBLE values.
-// A node shared by several parents is checked and reported once. The walk
+// A node shared by several parents is checked and reported once, so a tree
+// that contains itself (made through copy assignment) is walked once too. The walk
 // keeps its own stack, so any depth of tree is fine.
 std::vector<Diagnostic> verify(ZOA_file& unit);
 // One subprogram; `unit` (may be null) tells whose temporary a foreign one is.

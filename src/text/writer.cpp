@@ -1,21 +1,30 @@
 // Text writer: prints a unit in the form the reader rebuilds it from, ids and order preserved.
 #include "text/names.h"
+#include "text/write_buffer.h"
 
 #include <zoa/text.h>
 #include <zoa/zoa.h>
 
+#include "core/children.h"
+#include "core/node_kinds.h"
+
 #include <algorithm>
+#include <charconv>
 #include <cmath>
 #include <cstdio>
 #include <cstring>
 #include <map>
 #include <ostream>
-#include <sstream>
+#include <type_traits>
 #include <unordered_map>
 
 namespace ZOA::text {
 
 namespace {
+
+using detail::head;
+using detail::Out;
+using detail::writeText;
 
 constexpr int GLOBAL = -1;
 
@@ -24,58 +33,100 @@ struct Owner {
     unsigned int id;
 };
 
-void writeText(std::ostream& os, const char* s, std::size_t n) {
-    os << '"';
-    for (std::size_t i = 0; i < n; ++i) {
-        unsigned char c = static_cast<unsigned char>(s[i]);
-        switch (c) {
-            case '"': os << "\\\""; break;
-            case '\\': os << "\\\\"; break;
-            case '\n': os << "\\n"; break;
-            case '\t': os << "\\t"; break;
-            case '\r': os << "\\r"; break;
-            default:
-                if (c < 0x20 || c >= 0x7f) {
-                    char buf[8];
-                    std::snprintf(buf, sizeof buf, "\\x%02x", c);
-                    os << buf;
-                } else {
-                    os << static_cast<char>(c);
-                }
-        }
-    }
-    os << '"';
-}
-
 class Writer {
 public:
-    Writer(std::ostream& os, const ZOA_file& unit) : os(os), unit(unit) {}
+    template <class To> Writer(To& to, const ZOA_file& unit) : os(to), unit(unit) {}
     void run();
 
 private:
-    std::ostream& os;
+    Out os;
     const ZOA_file& unit;
     std::vector<SUBPROG*> subs;
     std::unordered_map<const TEMP*, Owner> temps;
     std::unordered_map<const LABEL*, Owner> labels;
     std::unordered_map<const NAME*, Owner> names;
     std::vector<std::map<unsigned int, LABEL*>> dead;  // referenced labels no longer in their map
+    // Each subprogram's own temps, labels and local names by id (those the maps
+    // give to it), and the file-level names by id: references from a
+    // subprogram's own statements are found here without hashing.
+    struct Own {
+        std::vector<const TEMP*> temps;
+        std::vector<const LABEL*> labels;
+        std::vector<const NAME*> names;
+    };
+    std::vector<Own> own;
+    std::vector<const NAME*> globalNames;
+    // The nodes being written or scanned, outermost first, to stop at a tree
+    // that contains itself.
+    std::vector<const TreeBase*> path;
+    struct Frame {
+        TreeBase* node;
+        bool entered;
+    };
+    std::vector<Frame> todo;
+
+    template <class T> static void index(std::vector<const T*>& v, unsigned int id, const T* x) {
+        if (id >= v.size()) v.resize(static_cast<std::size_t>(id) + 1, nullptr);
+        v[id] = x;
+    }
+    // The owner of a temp, label or name; false for one the unit does not hold.
+    // Looks in subprogram ctx's own ones by id (and, for names, the file-level
+    // ones) before the map.
+    template <class T>
+    static bool find(const T* x, int ctx, const std::vector<const T*>* mine, const std::vector<const T*>* global,
+                     const std::unordered_map<const T*, Owner>& map, Owner& o) {
+        unsigned int id = x->getId();
+        if (global && id < global->size() && (*global)[id] == x) {
+            o = {GLOBAL, id};
+            return true;
+        }
+        if (mine && id < mine->size() && (*mine)[id] == x) {
+            o = {ctx, id};
+            return true;
+        }
+        auto it = map.find(x);
+        if (it != map.end()) o = it->second;
+        return it != map.end();
+    }
+    const Own* mine(int ctx) const { return ctx >= 0 ? &own[static_cast<std::size_t>(ctx)] : nullptr; }
+    bool ownerOf(const TEMP* t, int ctx, Owner& o) const {
+        return find<TEMP>(t, ctx, ctx >= 0 ? &mine(ctx)->temps : nullptr, nullptr, temps, o);
+    }
+    bool ownerOf(const LABEL* l, int ctx, Owner& o) const {
+        return find<LABEL>(l, ctx, ctx >= 0 ? &mine(ctx)->labels : nullptr, nullptr, labels, o);
+    }
+    bool ownerOf(const NAME* n, int ctx, Owner& o) const {
+        return find<NAME>(n, ctx, ctx >= 0 ? &mine(ctx)->names : nullptr, &globalNames, names, o);
+    }
+
+    // True if n is already being written further out: a tree that contains
+    // itself through copy assignments. Compares n with one node of the path,
+    // the one at the last power of two of the depth, which any repetition meets
+    // within twice its length.
+    bool repeats(const TreeBase* n) const {
+        std::size_t d = path.size();
+        if (d == 0) return false;
+        std::size_t anchor = std::size_t(1) << (8 * sizeof(std::size_t) - 1 - static_cast<unsigned>(__builtin_clzll(d)));
+        return path[anchor - 1] == n;
+    }
 
     void ref(char letter, Owner o, int ctx) {
         if (o.sub != GLOBAL && o.sub != ctx) os << 's' << o.sub << ':';
         os << letter << o.id;
     }
     void label(LABEL* l, int ctx) {
-        auto it = labels.find(l);
-        if (!l || it == labels.end()) {
+        Owner o;
+        if (!l || !ownerOf(l, ctx, o)) {
             os << "nil";
             return;
         }
-        ref('L', it->second, ctx);
+        ref('L', o, ctx);
     }
     void constant(CONST* c);
     void expr(ExprBase* e, int ctx);
+    void exprBody(ExprBase* e, int ctx);
     void stmt(StmtBase* s, int ctx, int depth);
+    void stmtBody(StmtBase* s, int ctx, int depth);
     void nameDef(NAME* n, int ctx);
     void subprog(std::size_t i);
     void global(NAME* n);
@@ -85,60 +136,51 @@ private:
     void collectDead(std::size_t i, TreeBase* t);
 };
 
+// The children of forEachChild, less a NAME's values (a name is written by
+// reference), plus the expression a label JUMP may also hold: it is not
+// written, but a freed label it names has always been declared dead.
 template <class F> void Writer::scan(TreeBase* root, F&& f) {
-    std::vector<TreeBase*> todo{root};
+    todo.assign(1, Frame{root, false});
+    path.clear();
     while (!todo.empty()) {
-        TreeBase* t = todo.back();
-        todo.pop_back();
-        if (!t) continue;
+        Frame& top = todo.back();
+        if (top.entered) {
+            todo.pop_back();
+            path.pop_back();
+            continue;
+        }
+        TreeBase* t = top.node;
+        if (repeats(t)) {
+            todo.pop_back();
+            continue;
+        }
+        top.entered = true;
+        path.push_back(t);
+        auto push = [this](TreeBase* c) { todo.push_back(Frame{c, false}); };
         switch (t->getNodeType()) {
-            case BINOP_NODE:
-                todo.push_back(static_cast<BINOP*>(t)->getLeft());
-                todo.push_back(static_cast<BINOP*>(t)->getRight());
-                break;
-            case UNOP_NODE: todo.push_back(static_cast<UNOP*>(t)->getExpr()); break;
-            case MEM_NODE: todo.push_back(static_cast<MEM*>(t)->getExpr()); break;
-            case CALL_NODE:
-                todo.push_back(static_cast<CALL*>(t)->getFunctionPointer());
-                for (ExprBase* a : static_cast<CALL*>(t)->getArgs()) todo.push_back(a);
-                break;
             case NAME_NODE: {
                 NAME* n = static_cast<NAME*>(t);
                 f(t);
                 if (n->getLabelRef()) f(n->getLabelRef());
-                break;
+                continue;
             }
             case TEMP_NODE:
-            case BUF_TEMP_NODE: f(t); break;
-            case EXP_NODE: todo.push_back(static_cast<EXP*>(t)->getExpr()); break;
-            case MOVE_NODE:
-                todo.push_back(static_cast<MOVE*>(t)->getDst());
-                todo.push_back(static_cast<MOVE*>(t)->getSrc());
+            case BUF_TEMP_NODE: f(t); continue;
+            case JUMP_NODE: {
+                JUMP* j = static_cast<JUMP*>(t);
+                if (LABEL* l = j->getTarget()) f(l);
+                if (j->getKind() != DIRECT_EXPR && j->getExpr()) push(j->getExpr());
                 break;
-            case SEQ_NODE:
-                todo.push_back(static_cast<SEQ*>(t)->getLeft());
-                todo.push_back(static_cast<SEQ*>(t)->getRight());
-                break;
-            case JUMP_NODE:
-                todo.push_back(static_cast<JUMP*>(t)->getExpr());
-                if (LABEL* l = static_cast<JUMP*>(t)->getTarget()) f(l);
-                break;
+            }
             case CJUMP_NODE: {
                 CJUMP* c = static_cast<CJUMP*>(t);
-                todo.push_back(c->getLeft());
-                todo.push_back(c->getRight());
                 if (c->getIfTrue()) f(c->getIfTrue());
                 if (c->getIfFalse()) f(c->getIfFalse());
                 break;
             }
-            case CONST_NODE:
-            case TREE_BASE_NODE:
-            case EXPR_BASE_NODE:
-            case STMT_BASE_NODE:
-            case LABEL_NODE:
-            case SUBPROG_NODE:
-                break;
+            default: break;
         }
+        forEachChild(t, push);
     }
 }
 
@@ -148,7 +190,8 @@ void Writer::collectDead(std::size_t i, TreeBase* t) {
     scan(t, [&](TreeBase* x) {
         if (x->getNodeType() != LABEL_NODE) return;
         LABEL* l = static_cast<LABEL*>(x);
-        if (labels.count(l) || dead[i].count(l->getId()) || subs[i]->getAllLabels().count(l->getId())) return;
+        Owner o;
+        if (ownerOf(l, static_cast<int>(i), o) || dead[i].count(l->getId()) || subs[i]->getAllLabels().count(l->getId())) return;
         dead[i][l->getId()] = l;
         labels[l] = {static_cast<int>(i), l->getId()};
     });
@@ -156,7 +199,7 @@ void Writer::collectDead(std::size_t i, TreeBase* t) {
 
 void Writer::constant(CONST* c) {
     DataType t = c->getDataType();
-    os << "(CONST " << spell(t) << ' ';
+    os << head(CONST_NODE) << spell(t) << ' ';
     char buf[64];
     if (t == FLOAT || t == DOUBLE) {
         double v = c->getFValue();
@@ -176,25 +219,35 @@ void Writer::constant(CONST* c) {
         else
             os << "null";
     } else if (t == INT64_U) {
-        std::snprintf(buf, sizeof buf, "%llu", static_cast<unsigned long long>(c->getIValue()));
-        os << buf;
+        os << static_cast<unsigned long long>(c->getIValue());
     } else {
-        std::snprintf(buf, sizeof buf, "%lld", c->getIValue());
-        os << buf;
+        os << c->getIValue();
     }
     os << ')';
 }
 
+// A tree that contains itself is written up to the repetition, then
+// "(cycle)", which the reader refuses.
 void Writer::expr(ExprBase* e, int ctx) {
     if (!e) {
         os << "nil";
         return;
     }
+    if (repeats(e)) {
+        os << "(cycle)";
+        return;
+    }
+    path.push_back(e);
+    exprBody(e, ctx);
+    path.pop_back();
+}
+
+void Writer::exprBody(ExprBase* e, int ctx) {
     switch (e->getNodeType()) {
         case CONST_NODE: constant(static_cast<CONST*>(e)); return;
         case BINOP_NODE: {
             BINOP* b = static_cast<BINOP*>(e);
-            os << "(BINOP " << spell(b->getDataType()) << ' ' << spell(b->getOp()) << ' ';
+            os << head(BINOP_NODE) << spell(b->getDataType()) << ' ' << spell(b->getOp()) << ' ';
             expr(b->getLeft(), ctx);
             os << ' ';
             expr(b->getRight(), ctx);
@@ -203,19 +256,19 @@ void Writer::expr(ExprBase* e, int ctx) {
         }
         case UNOP_NODE: {
             UNOP* u = static_cast<UNOP*>(e);
-            os << "(UNOP " << spell(u->getDataType()) << ' ' << spell(u->getOp()) << ' ';
+            os << head(UNOP_NODE) << spell(u->getDataType()) << ' ' << spell(u->getOp()) << ' ';
             expr(u->getExpr(), ctx);
             os << ')';
             return;
         }
         case MEM_NODE:
-            os << "(MEM " << spell(e->getDataType()) << ' ';
+            os << head(MEM_NODE) << spell(e->getDataType()) << ' ';
             expr(static_cast<MEM*>(e)->getExpr(), ctx);
             os << ')';
             return;
         case CALL_NODE: {
             CALL* c = static_cast<CALL*>(e);
-            os << "(CALL " << spell(c->getDataType()) << ' ';
+            os << head(CALL_NODE) << spell(c->getDataType()) << ' ';
             if (c->getFunctionPointer())
                 expr(c->getFunctionPointer(), ctx);
             else
@@ -230,11 +283,11 @@ void Writer::expr(ExprBase* e, int ctx) {
         }
         case NAME_NODE: {
             NAME* n = static_cast<NAME*>(e);
-            auto it = names.find(n);
-            if (it != names.end()) {
-                ref(it->second.sub == GLOBAL ? 'g' : 'n', it->second, ctx);
+            Owner o;
+            if (ownerOf(n, ctx, o)) {
+                ref(o.sub == GLOBAL ? 'g' : 'n', o, ctx);
             } else if (n->getLabelRef()) {
-                os << "(NAME ";
+                os << head(NAME_NODE);
                 label(n->getLabelRef(), ctx);
                 os << (n->isDeclaredLocal() ? " local)" : ")");
             } else {
@@ -245,11 +298,11 @@ void Writer::expr(ExprBase* e, int ctx) {
         case TEMP_NODE:
         case BUF_TEMP_NODE: {
             TEMP* t = static_cast<TEMP*>(e);
-            auto it = temps.find(t);
-            if (it != temps.end())
-                ref('t', it->second, ctx);
+            Owner o;
+            if (ownerOf(t, ctx, o))
+                ref('t', o, ctx);
             else if (e->getNodeType() == BUF_TEMP_NODE)
-                os << "(BUF_TEMP " << t->getId() << ' ' << static_cast<BUF_TEMP*>(t)->getArraySize() << ')';
+                os << head(BUF_TEMP_NODE) << t->getId() << ' ' << static_cast<BUF_TEMP*>(t)->getArraySize() << ')';
             else
                 os << "(unknown-temp " << t->getId() << ')';
             return;
@@ -274,21 +327,31 @@ void Writer::stmt(StmtBase* s, int ctx, int depth) {
         os << "nil";
         return;
     }
+    if (repeats(s)) {
+        os << "(cycle)";
+        return;
+    }
+    path.push_back(s);
+    stmtBody(s, ctx, depth);
+    path.pop_back();
+}
+
+void Writer::stmtBody(StmtBase* s, int ctx, int depth) {
     switch (s->getNodeType()) {
         case MOVE_NODE:
-            os << "(MOVE ";
+            os << head(MOVE_NODE);
             expr(static_cast<MOVE*>(s)->getDst(), ctx);
             os << ' ';
             expr(static_cast<MOVE*>(s)->getSrc(), ctx);
             os << ')';
             return;
         case EXP_NODE:
-            os << "(EXP ";
+            os << head(EXP_NODE);
             expr(static_cast<EXP*>(s)->getExpr(), ctx);
             os << ')';
             return;
         case SEQ_NODE:
-            os << "(SEQ ";
+            os << head(SEQ_NODE);
             stmt(static_cast<SEQ*>(s)->getLeft(), ctx, depth + 1);
             os << ' ';
             stmt(static_cast<SEQ*>(s)->getRight(), ctx, depth + 1);
@@ -296,10 +359,11 @@ void Writer::stmt(StmtBase* s, int ctx, int depth) {
             return;
         case JUMP_NODE: {
             JUMP* j = static_cast<JUMP*>(s);
-            os << "(JUMP ";
+            os << head(JUMP_NODE);
             if (j->getKind() == DIRECT_LABEL) {
                 // An unknown target is written as nil too: keep the kind explicit.
-                if (!j->getTarget() || !labels.count(j->getTarget())) os << "label ";
+                Owner o;
+                if (!j->getTarget() || !ownerOf(j->getTarget(), ctx, o)) os << "label ";
                 label(j->getTarget(), ctx);
             } else {
                 if (!j->getExpr()) os << "expr ";
@@ -310,7 +374,7 @@ void Writer::stmt(StmtBase* s, int ctx, int depth) {
         }
         case CJUMP_NODE: {
             CJUMP* c = static_cast<CJUMP*>(s);
-            os << "(CJUMP " << spell(c->getRelOp()) << ' ';
+            os << head(CJUMP_NODE) << spell(c->getRelOp()) << ' ';
             expr(c->getLeft(), ctx);
             os << ' ';
             expr(c->getRight(), ctx);
@@ -423,13 +487,18 @@ void Writer::subprog(std::size_t i) {
 void Writer::run() {
     subs.assign(unit.getSubprogs().begin(), unit.getSubprogs().end());
     dead.resize(subs.size());
+    own.resize(subs.size());
     for (std::size_t i = 0; i < subs.size(); ++i) {
         int s = static_cast<int>(i);
-        for (TEMP* t : subs[i]->getAllTemps()) temps.emplace(t, Owner{s, t->getId()});
-        for (auto& [id, l] : subs[i]->getAllLabels()) labels.emplace(l, Owner{s, id});
-        for (NAME* n : subs[i]->getAllLocalNames()) names.emplace(n, Owner{s, n->getId()});
+        for (TEMP* t : subs[i]->getAllTemps())
+            if (temps.emplace(t, Owner{s, t->getId()}).second) index(own[i].temps, t->getId(), t);
+        for (auto& [id, l] : subs[i]->getAllLabels())
+            if (labels.emplace(l, Owner{s, id}).second && l->getId() == id) index(own[i].labels, id, l);
+        for (NAME* n : subs[i]->getAllLocalNames())
+            if (names.emplace(n, Owner{s, n->getId()}).second) index(own[i].names, n->getId(), n);
     }
-    for (NAME* n : unit.getNames()) names.emplace(n, Owner{GLOBAL, n->getId()});
+    for (NAME* n : unit.getNames())
+        if (names.emplace(n, Owner{GLOBAL, n->getId()}).second) index(globalNames, n->getId(), n);
     for (std::size_t i = 0; i < subs.size(); ++i) {
         for (auto& [id, l] : subs[i]->getAllLabels())
             for (StmtBase* s : l->getStmts()) collectDead(i, s);
@@ -446,7 +515,7 @@ void Writer::run() {
         os << "  (prototype " << spell(call->getDataType()) << ' ';
         writeText(os, key.data(), key.size());
         if (call->isCallStatic()) os << " static";
-        for (ExprBase* a : call->getArgs()) os << ' ' << (a ? spell(a->getDataType()) : std::string("VOID"));
+        for (ExprBase* a : call->getArgs()) os << ' ' << (a ? spell(a->getDataType()) : Spelling{"VOID", 0});
         os << ")\n";
     }
 
@@ -498,9 +567,9 @@ void Writer::run() {
 void write(std::ostream& os, const ZOA_file& unit) { Writer(os, unit).run(); }
 
 std::string write(const ZOA_file& unit) {
-    std::ostringstream os;
-    write(os, unit);
-    return os.str();
+    std::string text;
+    Writer(text, unit).run();
+    return text;
 }
 
 }  // namespace ZOA::text

@@ -2,7 +2,11 @@
 #include <zoa/verify.h>
 #include <zoa/zoa.h>
 
-#include <unordered_set>
+#include "core/children.h"
+#include "core/op_facts.h"
+#include "support/pointer_table.h"
+
+#include <unordered_map>
 
 namespace ZOA::verify {
 
@@ -23,18 +27,17 @@ private:
     bool asmMode;
     ZOA_file* unit;
     SUBPROG* sp = nullptr;
-    std::unordered_set<TreeBase*> seen;
-    std::unordered_set<const TEMP*> ownTemps;
+    PointerSet<const TreeBase*> seen;
+    PointerSet<const TEMP*> ownTemps;
+    std::unordered_map<const TEMP*, SUBPROG*> owners;  // filled at the first foreign temporary
     std::vector<TreeBase*> todo;
 
     void report(Severity s, TreeBase* n, std::string msg) { out.push_back({s, n, sp, std::move(msg)}); }
     void error(TreeBase* n, std::string msg) { report(Severity::ERROR, n, std::move(msg)); }
 
+    // Reports a missing child; the children present are walked by forEachChild.
     void child(TreeBase* parent, TreeBase* c, const char* what) {
-        if (!c)
-            error(parent, std::string(toString(parent->getNodeType())) + " has no " + what);
-        else
-            todo.push_back(c);
+        if (!c) error(parent, std::string(toString(parent->getNodeType())) + " has no " + what);
     }
     void target(TreeBase* parent, LABEL* l, const char* what) {
         if (!l) {
@@ -80,15 +83,16 @@ void Checker::name(NAME* n) {
 }
 
 void Checker::temp(TEMP* t) {
-    if (!sp || ownTemps.count(t)) return;
-    if (unit)
+    if (!sp || ownTemps.contains(t)) return;
+    if (unit && owners.empty())
         for (SUBPROG* other : unit->getSubprogs())
-            for (TEMP* o : other->getAllTemps())
-                if (o == t) {
-                    error(t, "temporary t" + std::to_string(t->getId()) + " of " + quoted(other->getName()) +
-                                 " is used in " + quoted(sp->getName()));
-                    return;
-                }
+            for (TEMP* o : other->getAllTemps()) owners.emplace(o, other);
+    auto it = owners.find(t);
+    if (it != owners.end()) {
+        error(t, "temporary t" + std::to_string(t->getId()) + " of " + quoted(it->second->getName()) +
+                     " is used in " + quoted(sp->getName()));
+        return;
+    }
     report(Severity::WARNING, t, "temporary t" + std::to_string(t->getId()) + " was not made by " + quoted(sp->getName()));
 }
 
@@ -102,7 +106,7 @@ void Checker::node(TreeBase* t) {
         case BINOP_NODE: {
             BINOP* b = static_cast<BINOP*>(t);
             BinopKind op = b->getOp();
-            if (asmMode && op != PLUS && op != MINUS && op != MUL && (op < EQ || op > GE))
+            if (asmMode && op != PLUS && op != MINUS && op != MUL && !isRelation(op))
                 report(Severity::WARNING, t, std::string("the assembly output cannot translate BINOP ") + toString(op));
             child(t, b->getLeft(), "left operand");
             child(t, b->getRight(), "right operand");
@@ -120,14 +124,16 @@ void Checker::node(TreeBase* t) {
             CALL* c = static_cast<CALL*>(t);
             if (c->getFunctionName().empty() && !c->getFunctionPointer())
                 error(t, "CALL has neither a function name nor a function pointer");
-            if (c->getFunctionPointer()) todo.push_back(c->getFunctionPointer());
             for (ExprBase* a : c->getArgs()) child(t, a, "argument");
             break;
         }
         case NAME_NODE: {
             NAME* n = static_cast<NAME*>(t);
-            if (n->getKind() == LABEL_REF && n->getLabelRef() && sp) target(n, n->getLabelRef(), "label");
-            else name(n);
+            if (n->getKind() == LABEL_REF && n->getLabelRef() && sp) {
+                target(n, n->getLabelRef(), "label");
+                return;  // its address is all a label name stands for
+            }
+            name(n);
             break;
         }
         case TEMP_NODE:
@@ -142,10 +148,7 @@ void Checker::node(TreeBase* t) {
             child(t, m->getSrc(), "source");
             break;
         }
-        case SEQ_NODE:
-            if (StmtBase* l = static_cast<SEQ*>(t)->getLeft()) todo.push_back(l);
-            if (StmtBase* r = static_cast<SEQ*>(t)->getRight()) todo.push_back(r);
-            break;
+        case SEQ_NODE: break;  // either side may be null
         case JUMP_NODE: {
             JUMP* j = static_cast<JUMP*>(t);
             if (j->getKind() == DIRECT_LABEL) {
@@ -159,7 +162,7 @@ void Checker::node(TreeBase* t) {
         }
         case CJUMP_NODE: {
             CJUMP* c = static_cast<CJUMP*>(t);
-            if (c->getRelOp() < EQ || c->getRelOp() > GE)
+            if (!isRelation(c->getRelOp()))
                 error(t, std::string("CJUMP relation ") + toString(c->getRelOp()) + " is not one of EQ, NE, LT, LE, GT, GE");
             child(t, c->getLeft(), "left operand");
             child(t, c->getRight(), "right operand");
@@ -175,6 +178,7 @@ void Checker::node(TreeBase* t) {
         case SUBPROG_NODE:
             break;
     }
+    forEachChild(t, [this](TreeBase* c) { todo.push_back(c); });
 }
 
 void Checker::walk(TreeBase* root) {
@@ -182,7 +186,7 @@ void Checker::walk(TreeBase* root) {
     while (!todo.empty()) {
         TreeBase* t = todo.back();
         todo.pop_back();
-        if (seen.insert(t).second) node(t);
+        if (seen.insert(t)) node(t);
     }
 }
 

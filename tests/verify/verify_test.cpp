@@ -150,3 +150,21 @@ TEST(Verify, DeepTreesAndSharedNodesAreWalkedOnce) {
 }
 
 }  // namespace
+
+// Copy assignment can make a node its own descendant: the walk still ends,
+// and each node is checked once.
+TEST(Verify, TreesThatContainThemselvesEnd) {
+    ZOA_file unit(true, false);
+    SUBPROG* sp = unit.createSubprog(INT_S, "f", false);
+    TEMP* t = sp->getTemp(INT_S, 0, IN_USE_TEMP);
+    SEQ* s = new SEQ(nullptr, nullptr);
+    *s = SEQ(s, new MOVE(t, nullptr));
+    sp->getStartLabel()->addStmt(s);
+    BINOP* b = new BINOP(INT_S, PLUS, t, nullptr);
+    *b = BINOP(INT_S, MUL, b, nullptr);
+    sp->getStartLabel()->addStmt(new EXP(b));
+    std::vector<verify::Diagnostic> found = verify::verify(unit);
+    ASSERT_EQ(2u, found.size());
+    EXPECT_EQ("error: MOVE has no source", verify::format(found[0]));
+    EXPECT_EQ("error: BINOP has no right operand", verify::format(found[1]));
+}
