@@ -1,164 +1,135 @@
 // zoa: reads a unit in the text form, verifies it and writes one of its outputs.
+#include "zoa_cli.h"
+#include "zoa_io.h"
+#include "zoa_report.h"
+
 #include <zoa/interp.h>
 #include <zoa/text.h>
 #include <zoa/verify.h>
 #include <zoa/zoa.h>
 
-#include <cctype>
-#include <cstdlib>
-#include <cstring>
-#include <vector>
-#include <fstream>
 #include <iostream>
-#include <iterator>
-#include <sstream>
+#include <ostream>
 #include <string>
+
+using namespace zoa_tool;
 
 namespace {
 
-const char* const usage =
-    "usage: zoa [--emit=c|c-msvc|asm|dot|ascii|text] [-o FILE] [--no-verify] FILE|-\n"
-    "       zoa --run=FUNC [ARG...] FILE|-\n"
-    "Reads a unit in the text form (FILE, or standard input for -), verifies it\n"
-    "and writes the chosen output (default: what the unit's flavour gives).\n"
-    "  --emit=c       C, GCC flavour        --emit=c-msvc  C, MSVC flavour\n"
-    "  --emit=asm     32-bit x86 assembly   --emit=dot     Graphviz digraphs\n"
-    "  --emit=ascii   indented tree dump    --emit=text    the text form again\n"
-    "  -o FILE        write to FILE instead of standard output\n"
-    "  --no-verify    skip the verifier\n"
-    "  --run=FUNC     interpret subprogram FUNC on the integer or real ARGs and\n"
-    "                 print its result (what the compiled C would return)\n"
-    "Exit status: 0 success, 1 bad input, 2 bad usage.\n";
+// The verifier's findings about what the exact assembly cannot translate
+// (the assembly then leaves operands out) all begin so.
+const std::string UNTRANSLATED = "the assembly output ";
 
-const char* const emits[] = {"", "c", "c-msvc", "asm", "dot", "ascii", "text"};
+// What an output's text is read for: the flags are fixed when the unit is made.
+const ZOA::text::Flavour* flavourFor(const std::string& emit) {
+    static const ZOA::text::Flavour gccC{true, false}, msvcC{false, false}, assembly{true, true};
+    if (emit == "c") return &gccC;
+    if (emit == "c-msvc") return &msvcC;
+    if (emit == "asm") return &assembly;  // the assembly is the same for both C flavours
+    return nullptr;
+}
 
-// Runs one subprogram through the interpreter and prints its value.
-int runSubprog(ZOA::ZOA_file& unit, const std::string& func, const std::vector<std::string>& args) {
-    std::vector<ZOA::interp::Value> values;
-    for (const std::string& a : args) {
-        char* end = nullptr;
-        long long i = std::strtoll(a.c_str(), &end, 0);
-        if (end && *end == '\0' && !a.empty()) {
-            values.push_back(ZOA::interp::Value::integer(ZOA::INT64_S, i));
-            continue;
+// Prints the verifier's findings; false when they stop the tool.
+bool verified(ZOA::ZOA_file& unit, const ZOA::text::Result& parsed, const std::string& fileName,
+              const Options& options, bool writesAssembly, Reporter& reporter) {
+    bool stop = false, untranslated = false;
+    for (const ZOA::verify::Diagnostic& d : ZOA::verify::verify(unit)) {
+        const ZOA::text::Position* p = parsed.positionOf(d.node);
+        if (!p && d.subprog) p = parsed.positionOf(d.subprog);
+        bool blocks = d.severity == ZOA::verify::Severity::ERROR || options.warningsAreErrors;
+        if (!blocks && options.exact && writesAssembly && !options.allowUntranslated &&
+            d.message.rfind(UNTRANSLATED, 0) == 0) {
+            blocks = untranslated = true;
         }
-        double d = std::strtod(a.c_str(), &end);
-        if (a.empty() || !end || *end) {
-            std::cerr << "zoa: argument '" << a << "' is no number\n";
-            return 2;
-        }
-        values.push_back(ZOA::interp::Value::floating(ZOA::DOUBLE, d));
+        ZOA::text::Diagnostic where{fileName, p ? p->line : 1, p ? p->column : 1, ""};
+        std::string message = d.message;
+        if (blocks && d.severity == ZOA::verify::Severity::WARNING && options.warningsAreErrors) message += " [-Werror]";
+        reporter.report(where, blocks ? Severity::ERROR : Severity::WARNING, message, p != nullptr);
+        stop = stop || blocks;
     }
-    ZOA::interp::Options options;
-    options.out = &std::cout;
-    ZOA::interp::Result r = ZOA::interp::run(unit, func, values, options);
+    if (untranslated)
+        reporter.fileError(fileName, "the exact assembly would leave these out; --allow-untranslated writes it anyway");
+    return !stop;
+}
+
+int run(ZOA::ZOA_file& unit, const Options& options, std::ostream& out) {
+    ZOA::interp::Options interpOptions;
+    interpOptions.out = &out;
+    ZOA::interp::Result r = ZOA::interp::run(unit, options.runFunc, options.runArgs, interpOptions);
     if (!r.ok()) {
-        std::cout.flush();
-        std::cerr << "zoa: " << func << ": " << ZOA::interp::toString(r.status) << ": " << r.message << '\n';
+        out.flush();
+        std::cerr << "zoa: " << options.runFunc << ": " << ZOA::interp::toString(r.status) << ": " << r.message
+                  << '\n';
         return 1;
     }
-    std::cout << ZOA::interp::format(r.value) << '\n';
+    out << ZOA::interp::format(r.value) << '\n';
     return 0;
 }
 
-int badUsage(const std::string& why) {
-    std::cerr << "zoa: " << why << '\n' << usage;
-    return 2;
+// False when the library refused to write (it said why on the diagnostic stream).
+bool emit(ZOA::ZOA_file& unit, const std::string& kind, std::ostream& out) {
+    if (kind == "dot") return unit.dumpDot(out);
+    if (kind == "ascii") return unit.dumpAscii(out);
+    if (kind == "text") {
+        ZOA::text::write(out, unit);
+        return true;
+    }
+    return unit.decompile(out);
 }
 
 }  // namespace
 
 int main(int argc, char** argv) {
-    std::string emit, output, input, runFunc;
-    std::vector<std::string> runArgs;
-    bool verifyIt = true, haveInput = false;
-    for (int i = 1; i < argc; ++i) {
-        std::string a = argv[i];
-        if (a == "--help" || a == "-h") {
-            std::cout << usage;
-            return 0;
-        }
-        if (a == "--version") {
-            std::cout << "zoa 0.1.0\n";
-            return 0;
-        }
-        if (a.rfind("--emit=", 0) == 0) {
-            emit = a.substr(7);
-            bool known = false;
-            for (const char* e : emits) known = known || (*e && emit == e);
-            if (!known) return badUsage("unknown output '" + emit + "'");
-        } else if (a == "-o") {
-            if (++i >= argc) return badUsage("-o needs a file name");
-            output = argv[i];
-        } else if (a == "--no-verify") {
-            verifyIt = false;
-        } else if (a.rfind("--run=", 0) == 0 && a.size() > 6) {
-            runFunc = a.substr(6);
-        } else if (a != "-" && a[0] == '-' && (runFunc.empty() || !(std::isdigit(static_cast<unsigned char>(a[1])) || a[1] == '.'))) {
-            return badUsage("unknown option '" + a + "'");
-        } else {
-            if (haveInput && !runFunc.empty()) runArgs.push_back(input);
-            else if (haveInput) return badUsage("more than one input");
-            input = a;
-            haveInput = true;
-        }
+    Options options;
+    std::string why;
+    if (!parseCommandLine(argc, argv, options, why)) {
+        std::cerr << "zoa: " << why << '\n' << USAGE;
+        return 2;
     }
-    if (!haveInput) return badUsage("no input");
+    if (options.help) {
+        std::cout << USAGE;
+        return 0;
+    }
+    if (options.version) {
+        std::cout << VERSION;
+        return 0;
+    }
 
+    const bool colour = colourWanted();
     std::string source;
-    std::string fileName = input == "-" ? "<stdin>" : input;
-    if (input == "-") {
-        source.assign(std::istreambuf_iterator<char>(std::cin), std::istreambuf_iterator<char>());
-    } else {
-        std::ifstream in(input, std::ios::binary);
-        if (!in) {
-            std::cerr << fileName << ": error: cannot open the file\n";
-            return 1;
-        }
-        source.assign(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+    const std::string fileName = options.input == "-" ? "<stdin>" : options.input;
+    if (!readWhole(options.input, source, why)) {
+        Reporter(std::cerr, {}, colour).fileError(fileName, why);
+        return 1;
     }
+    Reporter reporter(std::cerr, source, colour);
 
-    ZOA::text::Result r = ZOA::text::parse(source, fileName);
-    if (r.ok() && (emit == "c" || emit == "c-msvc" || emit == "asm")) {
-        // The flags are fixed at construction: read the text again for the chosen output.
-        ZOA::text::Flavour f{emit == "asm" ? r.unit()->IsGcc() : emit == "c", emit == "asm"};
-        r = ZOA::text::parse(source, fileName, f);
+    const ZOA::text::Flavour* flavour = options.runFunc.empty() ? flavourFor(options.emit) : nullptr;
+    ZOA::text::Result parsed =
+        flavour ? ZOA::text::parse(source, fileName, *flavour) : ZOA::text::parse(source, fileName);
+    for (const ZOA::text::Diagnostic& d : parsed.diagnostics()) reporter.report(d, Severity::ERROR, d.message);
+    if (!parsed.ok()) return 1;
+    ZOA::ZOA_file& unit = *parsed.unit();
+    unit.setProfile(options.exact ? ZOA::Profile::EXACT : ZOA::Profile::SOUND);
+
+    bool writesAssembly = options.runFunc.empty() && unit.IsAsmMode() && (options.emit.empty() || options.emit == "asm");
+    if (options.verify && !verified(unit, parsed, fileName, options, writesAssembly, reporter)) return 1;
+
+    FileOutput file;
+    const std::string outName = options.output == "-" ? "<stdout>" : options.output;
+    if (!file.open(options.output, why)) {
+        reporter.fileError(outName, why);
+        return 1;
     }
-    for (const auto& d : r.diagnostics()) std::cerr << ZOA::text::format(d) << '\n';
-    if (!r.ok()) return 1;
-    ZOA::ZOA_file& unit = *r.unit();
-
-    if (verifyIt) {
-        bool failed = false;
-        for (const auto& d : ZOA::verify::verify(unit)) {
-            const ZOA::text::Position* p = r.positionOf(d.node);
-            if (!p && d.subprog) p = r.positionOf(d.subprog);
-            std::cerr << fileName << ':' << (p ? p->line : 1) << ':' << (p ? p->column : 1) << ": "
-                      << ZOA::verify::format(d) << '\n';
-            failed = failed || d.severity == ZOA::verify::Severity::ERROR;
-        }
-        if (failed) return 1;
+    std::ostream out(&file);
+    // The exact notes and statistics go to standard output; keep them in order with the output there.
+    if (options.exact && options.output == "-") unit.setDiagnosticStream(&out);
+    int status = 0;
+    if (!options.runFunc.empty()) status = run(unit, options, out);
+    else if (!emit(unit, options.emit, out)) status = 1;
+    if (!file.finish(why)) {
+        reporter.fileError(outName, why);
+        return 1;
     }
-
-    if (!runFunc.empty()) return runSubprog(unit, runFunc, runArgs);
-
-    std::ofstream file;
-    if (!output.empty()) {
-        file.open(output, std::ios::binary);
-        if (!file) {
-            std::cerr << output << ": error: cannot write the file\n";
-            return 1;
-        }
-    }
-    std::ostream& os = output.empty() ? std::cout : file;
-    if (emit == "dot")
-        unit.dumpDot(os);
-    else if (emit == "ascii")
-        unit.dumpAscii(os);
-    else if (emit == "text")
-        ZOA::text::write(os, unit);
-    else
-        unit.decompile(os);
-    os.flush();
-    return os ? 0 : 1;
+    return status;
 }

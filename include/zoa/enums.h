@@ -68,9 +68,21 @@ enum BinopKind {
     MAX_BINOP = 18  // not an operator: what CJUMP::notRel answers for a non-relation
 };
 
-// Unary operators of UNOP. CONV4 to CONV26 convert the operand to the UNOP's
-// own type; which source type each is meant for is the client's choice, only
-// CONV4 (8-bit to 32-bit, inserted by BINOP) has a fixed meaning.
+// Unary operators of UNOP: ABS, NEG, NOT and BITWISE_NOT are C's abs, -, ! and ~.
+// The UNOP's own type is the type its result is declared and used as; a
+// conversion's C text does not name it. Each CONVn writes one fixed cast,
+// whatever the UNOP's type and the operand's (docs/conversions.md):
+//   (int)            CONV4, CONV18, CONV20    (unsigned int)  CONV17, CONV21
+//   (char)           CONV7, CONV16, CONV25    (float)         CONV13
+//   (unsigned char)  CONV6, CONV15, CONV26    (double)        CONV14
+//   (int64)          CONV24                   (char*)         CONV22
+//   (int*)           CONV23
+//   no cast          CONV5, CONV8 to CONV12, CONV19: the operand's value goes
+//                    on as it is, converted only by the assignment or
+//                    operation around the UNOP.
+// So a CONV6 keeps the low byte even in an INT_S UNOP: CONV6 of 178571428 is
+// 164, in the interpreter too. BINOP inserts CONV4 by itself (an 8-bit operand
+// widened to int); the exact assembly translates CONV4 only.
 enum UnopKind {
     ABS = 0,
     NEG = 1,
@@ -108,6 +120,10 @@ enum NameKind {
     SUBPROG_REF = 1,
     CONST_ARRAY_REF = 2,
     DATA_ARRAY_REF = 3,
+    // The text is the string as C source spells it between the quotes,
+    // escapes included ("a\\n" for a and a newline), not its bytes. The exact
+    // C and assembly write it as it stands (the C adds a backslash before a
+    // '"' that has none); the sound outputs decode its escapes to bytes.
     STRINGLIT_REF = 4,
     STATIC_DATA_REF = 5,
     EXTERN_DATA_REF = 6

@@ -57,6 +57,9 @@ public:
     static unsigned int getMemoryUsage();
     // Returns to the first block, obtaining it if there is none (ZOA_file does this).
     static void rewind();
+    // How many rewinds there have been. A unit keeps the count it started with,
+    // so it can tell that a later unit took the arena over (its nodes are gone).
+    static unsigned long long getGeneration() { return generation; }
 
     MemMgr& operator=(const MemMgr&) { return *this; }
 
@@ -68,6 +71,7 @@ public:
     static Bump bump;
 
 private:
+    static unsigned long long generation;
     // typed: the request came through allocateAligned (see the choices above).
     static void* allocateSlow(std::size_t size, std::size_t align, bool typed);
 };

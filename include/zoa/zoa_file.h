@@ -5,6 +5,7 @@
 #include <zoa/enums.h>
 #include <zoa/export.h>
 #include <zoa/expr.h>
+#include <zoa/memmgr.h>
 #include <zoa/subprog.h>
 
 #include <iosfwd>
@@ -27,7 +28,19 @@ enum class Profile { EXACT, SOUND };
 // Constructing a ZOA_file rewinds the arena: every node of an earlier unit is
 // given up. Build, output and abandon one unit at a time, on one thread.
 //
-// Output operations write onto the caller's stream and always return true:
+// Misuse the library catches, and what it cannot:
+//  - A unit whose arena was rewound under it (a later ZOA_file was constructed,
+//    or MemMgr::rewind called, while it was alive) is stale: isCurrent() is
+//    false, and decompile, dumpDot and dumpAscii write nothing to the output
+//    stream, put one line on the diagnostic stream and return false. The unit
+//    itself still exists; only its nodes are gone.
+//  - A node kept from an earlier unit and put into a later unit's tree is not
+//    detected (a node carries no stamp of its unit): its bytes belong to the
+//    later unit's nodes. The outputs still terminate on such a tree, as on any
+//    pointer graph with cycles, but what they write for it means nothing.
+//
+// Output operations write onto the caller's stream and return true (false
+// only for a stale unit, see above):
 //  - decompile: C source (GCC flavour when isGcc, MSVC otherwise) or, in
 //    assembly mode, 32-bit x86 assembly for the GNU assembler (Intel syntax).
 //    Afterwards the unit forgets its subprograms, file-level names and call
@@ -77,6 +90,8 @@ public:
     ZOA_file& operator=(const ZOA_file&) = delete;
 
     bool IsGcc() const { return isGcc; }
+    // False once a later unit has rewound the arena under this one.
+    bool isCurrent() const { return arenaGeneration == MemMgr::getGeneration(); }
     bool IsAsmMode() const { return asmMode; }
     unsigned int getMemoryUsage();
 
@@ -122,11 +137,15 @@ private:
     bool needsPrototype(const std::string& name) const;
     void addFunctionPrototype(SUBPROG* sp);
     void addFunctionPrototype(NAME* n);
+    // For the output operations: true when the unit is current; otherwise says
+    // so on the diagnostic stream.
+    bool checkCurrent() const;
 
     bool isGcc;
     bool asmMode;
     Profile profile = Profile::EXACT;
     std::ostream* diagnostics = nullptr;
+    unsigned long long arenaGeneration = 0;  // the arena's rewind count at construction
     std::list<SUBPROG*> subprogs;
     std::list<NAME*> names;
     std::map<std::string, CALL*> callPrototypes;

@@ -73,8 +73,11 @@ void* allocateOversized(Arena& a, std::size_t size, std::size_t align = 1) {
 
 }  // namespace
 
+unsigned long long MemMgr::generation = 0;
+
 void MemMgr::rewind() {
     Arena& a = arena();
+    ++generation;
     for (void* p : a.oversized) std::free(p);
     a.oversized.clear();
     if (a.memBlkPtrs.empty()) {

@@ -9,6 +9,14 @@ ZOA_file::ZOA_file(bool isGcc, bool asmMode) : ZOA_file(isGcc, asmMode, Profile:
 
 ZOA_file::ZOA_file(bool isGcc, bool asmMode, Profile profile) : isGcc(isGcc), asmMode(asmMode), profile(profile) {
     MemMgr::rewind();
+    arenaGeneration = MemMgr::getGeneration();
+}
+
+bool ZOA_file::checkCurrent() const {
+    if (isCurrent()) return true;
+    getDiagnosticStream() << "ZOA_file: a later ZOA_file rewound the arena under this unit; its nodes are gone, "
+                             "nothing written\n";
+    return false;
 }
 
 std::ostream& ZOA_file::getDiagnosticStream() const {

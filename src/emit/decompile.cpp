@@ -10,6 +10,7 @@
 namespace ZOA {
 
 bool ZOA_file::decompile(std::ostream& os) {
+    if (!checkCurrent()) return false;
     std::unique_ptr<DecompileBase> emitter;
     if (asmMode) {
         auto* x86 = new DecompileASM(os, isGcc);

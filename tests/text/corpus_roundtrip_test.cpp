@@ -46,12 +46,12 @@ Outputs outputs(ZOA_file& unit) {
     return o;
 }
 
-// The tool's output for a text, with the given --emit. Some corpus programs
+// The tool's exact output for a text, with the given --emit. Some corpus programs
 // store into static data names, which the verifier refuses as destinations.
 std::string throughTool(const std::string& dir, const std::string& name, const std::string& text,
                         const char* emit) {
     std::string file = ZOA::testing::writeFile(dir, name + ".zoa", text);
-    ZOA::testing::CommandResult r = ZOA::testing::runCommand(std::string("'") + ZOA_TOOL + "' --no-verify --emit=" +
+    ZOA::testing::CommandResult r = ZOA::testing::runCommand(std::string("'") + ZOA_TOOL + "' --exact --no-verify --emit=" +
                                                              emit + " '" + file + "' 2>/dev/null");
     EXPECT_EQ(r.status, 0) << name << ": " << r.output;
     return r.output;

@@ -6,6 +6,7 @@
 namespace ZOA {
 
 bool ZOA_file::dumpAscii(std::ostream& os) {
+    if (!checkCurrent()) return false;
     for (SUBPROG* sp : subprogs) DumpTree(sp, os, true);
     return true;
 }

@@ -441,6 +441,7 @@ template <class F> void DumpDot::putFloating(F v) {
 }
 
 bool ZOA_file::dumpDot(std::ostream& os) {
+    if (!checkCurrent()) return false;
     DumpDot::Workspace workspace(os);
     for (SUBPROG* sp : subprogs) DumpDot dump(sp, os, &workspace, &getDiagnosticStream());
     return true;
