@@ -10,7 +10,7 @@ namespace ZOA {
 // walk's stack, sanitizers included. A cycle built with the copy assignments
 // (`*s = SEQ(s, nullptr)`) reaches it at once. A client's own recursive walk
 // can use NestingGuard the same way.
-constexpr unsigned int MAX_WALK_DEPTH = 10000;
+constexpr unsigned int MAX_WALK_DEPTH = 5000;
 
 // What entering one level gives.
 enum class Nest {

@@ -41,24 +41,14 @@ inline void pushStatements(LABEL* l, std::vector<StmtBase*>& stack) {
         if (*it) stack.push_back(*it);
 }
 
-// One statement: a SEQ queues its sides above a null entry that marks its end;
-// a jump may pull its target, whose statements then run before anything
-// queued earlier. False when the SEQs nest too deep.
-inline bool traceStatement(StmtBase* s, LABEL*& last, std::size_t& open, TraceListener& listener,
-                           std::vector<StmtBase*>& stack) {
-    NodeType k = s->getNodeType();
-    if (k == SEQ_NODE) {
-        if (++open > MAX_TRACE_NESTING) return false;
-        SEQ* seq = static_cast<SEQ*>(s);
-        stack.push_back(nullptr);
-        if (seq->getRight()) stack.push_back(seq->getRight());
-        if (seq->getLeft()) stack.push_back(seq->getLeft());
-        return true;
-    }
+// A jump may pull its target, whose statements then run before anything
+// queued earlier.
+inline void tracePull(StmtBase* s, NodeType k, LABEL*& last, std::size_t& open, TraceListener& listener,
+                      std::vector<StmtBase*>& stack) {
     LABEL* candidate = nullptr;
     if (k == JUMP_NODE && static_cast<JUMP*>(s)->getKind() == DIRECT_LABEL) candidate = static_cast<JUMP*>(s)->getTarget();
     else if (k == CJUMP_NODE) candidate = static_cast<CJUMP*>(s)->getIfFalse();
-    if (!candidate || !listener.place(candidate)) return true;
+    if (!candidate || !listener.place(candidate)) return;
     listener.pulled(s, last);
     last = candidate;
     // The SEQs this jump ended are closed before the target's statements go
@@ -68,6 +58,22 @@ inline bool traceStatement(StmtBase* s, LABEL*& last, std::size_t& open, TraceLi
         --open;
     }
     pushStatements(candidate, stack);
+}
+
+// One statement: a SEQ queues its sides above a null entry that marks its
+// end; a jump may pull. False when the SEQs nest too deep.
+inline bool traceStatement(StmtBase* s, LABEL*& last, std::size_t& open, TraceListener& listener,
+                           std::vector<StmtBase*>& stack) {
+    NodeType k = s->getNodeType();
+    if (k == SEQ_NODE) {
+        if (++open > MAX_TRACE_NESTING) return false;
+        SEQ* seq = static_cast<SEQ*>(s);
+        stack.push_back(nullptr);
+        if (seq->getRight()) stack.push_back(seq->getRight());
+        if (seq->getLeft()) stack.push_back(seq->getLeft());
+    } else if (k == JUMP_NODE || k == CJUMP_NODE) {
+        tracePull(s, k, last, open, listener, stack);
+    }
     return true;
 }
 

@@ -35,12 +35,6 @@ void DecompileBase::pulled(StmtBase* jump, LABEL* prev) { jump->setAnnotation(ne
 
 void DecompileBase::buildTraces() { ZOA::buildTraces(curSubprog, *this, traceStack); }
 
-void DecompileBase::acceptNested(TreeBase* n) {
-    NestingLevel level(nesting);
-    if (level.entered()) n->accept(this);
-    else if (level.cutHere()) writeCutNote();
-}
-
 bool DecompileBase::fallsThrough(StmtBase* stmt) const {
     TreeAnnotation* a = stmt->getAnnotation();
     return a && typeid(*a) == typeid(TraceAnnotation) && static_cast<TraceAnnotation*>(a)->prevLabel == curLabel;

@@ -53,7 +53,11 @@ public:
     // n->accept(this), one level deeper. Where MAX_WALK_DEPTH cuts the walk (a
     // cycle made with the copy assignments) the output's writeCutNote() comes
     // instead, and the rest of the statement of the label that holds it is left out.
-    void acceptNested(TreeBase* n);
+    void acceptNested(TreeBase* n) {
+        NestingLevel level(nesting);
+        if (level.entered()) n->accept(this);
+        else if (level.cutHere()) writeCutNote();
+    }
     virtual void writeCutNote() = 0;
 
 protected:

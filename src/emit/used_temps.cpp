@@ -34,8 +34,6 @@ void UsedTemps::collect(SUBPROG* sp) {
 // Which nodes are reached matters for the marks, not the order; a CALL is
 // listed after its operands. A nested SUBPROG is not entered.
 void UsedTemps::walk(TreeBase* n) {
-    NestingLevel level(nesting);
-    if (!level.entered()) return;
     NodeType k = n->getNodeType();
     switch (k) {
     case TEMP_NODE:
@@ -44,6 +42,8 @@ void UsedTemps::walk(TreeBase* n) {
     case SUBPROG_NODE: return;
     default: break;
     }
+    NestingLevel level(nesting);
+    if (!level.entered()) return;
     forEachChild(n, k, [this](TreeBase* child) { walk(child); });
     if (k == CALL_NODE) callList.push_back(static_cast<CALL*>(n));
 }

@@ -1,5 +1,7 @@
-// TextSink: deep indentation in chunks.
+// TextSink: deep indentation and numbers beyond the inline cases.
 #include "support/text_sink.h"
+
+#include "support/decimal.h"
 
 namespace ZOA {
 
@@ -13,5 +15,17 @@ TextSink& TextSink::writeBlanks(unsigned int n) {
     if (n) write(blanks, n * 4);
     return *this;
 }
+
+template <class T> TextSink& TextSink::writeNumber(T v) {
+    if (depth != 0 && CAPACITY - used >= MAX_DECIMAL_CHARS) {
+        used += writeDecimal(buf.get() + used, v);
+        return *this;
+    }
+    char digits[MAX_DECIMAL_CHARS];
+    return write(digits, writeDecimal(digits, v));
+}
+
+template TextSink& TextSink::writeNumber(unsigned long long);
+template TextSink& TextSink::writeNumber(long long);
 
 }  // namespace ZOA

@@ -2,7 +2,6 @@
 #ifndef ZOA_SUPPORT_TEXT_SINK_H
 #define ZOA_SUPPORT_TEXT_SINK_H
 
-#include "support/decimal.h"
 #include "support/short_copy.h"
 
 #include <zoa/memmgr.h>
@@ -73,23 +72,17 @@ public:
     }
     // Plain decimal.
     TextSink& writeUnsigned(unsigned long long v) {
-        if (depth == 0 || CAPACITY - used < MAX_DECIMAL_CHARS) return writeNumberApart(v);
-        char* p = buf.get() + used;
-        if (v < 100) {
+        if (v < 100 && depth != 0 && CAPACITY - used >= 2) {
             // Temporary and label ids are mostly small.
+            char* p = buf.get() + used;
             if (v >= 10) *p++ = static_cast<char>('0' + v / 10);
             *p++ = static_cast<char>('0' + v % 10);
             used = static_cast<std::size_t>(p - buf.get());
             return *this;
         }
-        used += writeDecimal(p, v);
-        return *this;
+        return writeNumber(v);
     }
-    TextSink& writeInt(long long v) {
-        if (depth == 0 || CAPACITY - used < MAX_DECIMAL_CHARS) return writeNumberApart(v);
-        used += writeDecimal(buf.get() + used, v);
-        return *this;
-    }
+    TextSink& writeInt(long long v) { return writeNumber(v); }
 
     // Hands what is gathered to the stream.
     void flush() {
@@ -100,10 +93,8 @@ public:
 
 private:
     TextSink& writeBlanks(unsigned int n);
-    template <class T> TextSink& writeNumberApart(T v) {
-        char digits[MAX_DECIMAL_CHARS];
-        return write(digits, writeDecimal(digits, v));
-    }
+    // For unsigned long long and long long (text_sink.cpp).
+    template <class T> TextSink& writeNumber(T v);
 
     static constexpr std::size_t CAPACITY = 1 << 15;
     static constexpr unsigned int MAX_INLINE_INDENT = 4;

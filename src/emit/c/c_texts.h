@@ -9,10 +9,8 @@
 #include <string_view>
 
 // Header-only, so that the interpreter and the campaigns, which link the
-// shared library and not its hidden symbols, name types as the C output does.
+// shared library and not its hidden symbols, read the same tables.
 namespace ZOA::ctext {
-
-namespace detail {
 
 inline constexpr std::string_view TYPE_NAMES[DATA_TYPE_COUNT] = {
     "unsigned char ",  // CHAR_U
@@ -58,21 +56,19 @@ inline constexpr std::string_view UNOP_TEXTS[UNOP_KIND_COUNT] = {
     "(unsigned char)",  // CONV26
 };
 
-}  // namespace detail
-
 // The text for the value, or "" for a value the table does not cover. Views,
 // so that writing one needs no strlen.
 constexpr std::string_view typeName(DataType t) {
     unsigned int i = static_cast<unsigned int>(t);
-    return i < DATA_TYPE_COUNT ? detail::TYPE_NAMES[i] : "";
+    return i < DATA_TYPE_COUNT ? TYPE_NAMES[i] : "";
 }
 constexpr std::string_view binopText(BinopKind op) {
     unsigned int i = static_cast<unsigned int>(op);
-    return i < MAX_BINOP ? detail::BINOP_TEXTS[i] : "";
+    return i < MAX_BINOP ? BINOP_TEXTS[i] : "";
 }
 constexpr std::string_view unopText(UnopKind op) {
     unsigned int i = static_cast<unsigned int>(op);
-    return i < UNOP_KIND_COUNT ? detail::UNOP_TEXTS[i] : "";
+    return i < UNOP_KIND_COUNT ? UNOP_TEXTS[i] : "";
 }
 
 namespace detail {

@@ -37,11 +37,6 @@ void DecompileC::printFlat(ExprBase* e) {
 // Statements print their expressions through here: one type query, then a
 // direct call of the printer, where accept would cost two virtual calls.
 void DecompileC::printExpr(ExprBase* e, NodeType t) {
-    NestingLevel level(nesting);
-    if (!level.entered()) {
-        if (level.cutHere()) writeCutNote();
-        return;
-    }
     switch (t) {
     case TEMP_NODE:
     case BUF_TEMP_NODE:
@@ -49,10 +44,19 @@ void DecompileC::printExpr(ExprBase* e, NodeType t) {
         writeUnsigned(static_cast<TEMP*>(e)->getId());
         return;
     case CONST_NODE: DecompileC::visit(static_cast<CONST*>(e)); return;
+    case NAME_NODE: DecompileC::visit(static_cast<NAME*>(e)); return;
+    default: break;
+    }
+    // Only the kinds with operands go a level deeper.
+    NestingLevel level(nesting);
+    if (!level.entered()) {
+        if (level.cutHere()) writeCutNote();
+        return;
+    }
+    switch (t) {
     case BINOP_NODE: DecompileC::visit(static_cast<BINOP*>(e)); return;
     case MEM_NODE: DecompileC::visit(static_cast<MEM*>(e)); return;
     case UNOP_NODE: DecompileC::visit(static_cast<UNOP*>(e)); return;
-    case NAME_NODE: DecompileC::visit(static_cast<NAME*>(e)); return;
     case CALL_NODE: DecompileC::visit(static_cast<CALL*>(e)); return;
     default: e->accept(this); return;
     }

@@ -112,6 +112,10 @@ public:
     AsmRegister stealRegister(RegClass cls);
     void assignRegister(ExprBase* e, AsmRegister reg, bool indirect);
     AsmRegister loadIntoRegister(ExprBase* e, bool claim);
+    // "mov x, <e>", and e recorded as living in x.
+    AsmRegister loadInto(AsmRegister x, ExprBase* e);
+    // "mov <d>, r" (d as a memory operand), and d recorded as living in r.
+    void storeFrom(AsmRegister r, ExprBase* d);
     bool isReserved(AsmRegister reg) const { return reg < 64 && regInUse[reg]; }
 
     // --- operands and data (operands.cpp)
@@ -173,6 +177,7 @@ private:
     void putOperand(ExprBase* e, bool useRegister);
     void putByteOperand(ExprBase* e);
     void putAddress(MEM* mem);  // "[A op B]"
+    AsmRegister readAddress(AsmRegister x, MEM* mem);  // "mov x, [A op B]"
     void putLabel(LABEL* l);
 
     void visitExpr(ExprBase* e) {

@@ -93,13 +93,7 @@ AsmRegister DecompileASM::emitBinop(BinopKind op, ExprBase* l, ExprBase* r) {
     if (op != MUL) {
         if (isConst(l) && isConst(r)) {
             if (regOf(l) == NO_REGISTER) {
-                AsmRegister x = allocateDword();
-                line() << "mov ";
-                putReg(x);
-                put(", ");
-                putOperand(l, true);
-                endLine();
-                assignRegister(l, x, false);
+                loadInto(allocateDword(), l);
             } else {
                 assignRegister(l, registerOfClass(regOf(l), DWORD), false);
             }
@@ -185,14 +179,7 @@ AsmRegister DecompileASM::prepareAddress(MEM* mem) {
         if (!operand || isConst(operand)) continue;
         ExprAnnotation* a = annotationOf(operand);
         if (a && a->reg != NO_REGISTER) continue;
-        AsmRegister x = allocateForType(operand);
-        line() << "mov ";
-        putReg(x);
-        put(", ");
-        putOperand(operand, true);
-        endLine();
-        assignRegister(operand, x, false);
-        last = x;
+        last = loadInto(allocateForType(operand), operand);
     }
     if (last != NO_REGISTER) return last;
     ExprAnnotation* la = annotationOf(b->getLeft());
@@ -218,8 +205,7 @@ void DecompileASM::putAddress(MEM* mem) {
     put("]");
 }
 
-AsmRegister DecompileASM::loadFromAddress(MEM* mem) {
-    AsmRegister x = prepareAddress(mem);
+AsmRegister DecompileASM::readAddress(AsmRegister x, MEM* mem) {
     line() << "mov ";
     putReg(x);
     put(", ");
@@ -228,16 +214,12 @@ AsmRegister DecompileASM::loadFromAddress(MEM* mem) {
     return x;
 }
 
+AsmRegister DecompileASM::loadFromAddress(MEM* mem) { return readAddress(prepareAddress(mem), mem); }
+
 AsmRegister DecompileASM::loadAddressedValue(MEM* mem) {
     prepareAddress(mem);
     if (mem) ensureAnnotation(mem);
-    AsmRegister x = allocateForType(mem);
-    line() << "mov ";
-    putReg(x);
-    put(", ");
-    putAddress(mem);
-    endLine();
-    return x;
+    return readAddress(allocateForType(mem), mem);
 }
 
 void DecompileASM::storeToAddress(MEM* mem, AsmRegister v) {

@@ -279,14 +279,26 @@ AsmRegister DecompileASM::loadIntoRegister(ExprBase* e, bool claim) {
         if (claim) claimRegister(r);
         return r;
     }
-    AsmRegister r = allocateForType(e);
+    return loadInto(allocateForType(e), e);
+}
+
+AsmRegister DecompileASM::loadInto(AsmRegister x, ExprBase* e) {
     line() << "mov ";
-    putReg(r);
+    putReg(x);
     put(", ");
     putOperand(e, true);
     endLine();
-    assignRegister(e, r, false);
-    return r;
+    assignRegister(e, x, false);
+    return x;
+}
+
+void DecompileASM::storeFrom(AsmRegister r, ExprBase* d) {
+    line() << "mov ";
+    putOperand(d, false);
+    put(", ");
+    putReg(r);
+    endLine();
+    assignRegister(d, r, false);
 }
 
 }  // namespace ZOA

@@ -111,24 +111,12 @@ void DecompileASM::visit(MOVE* m) {
 void DecompileASM::moveTempTemp(ExprBase* d, ExprBase* s) {
     visitExpr(s);
     visitExpr(d);
-    AsmRegister r = loadIntoRegister(s, false);
-    line() << "mov ";
-    putOperand(d, false);
-    put(", ");
-    putReg(r);
-    endLine();
-    assignRegister(d, r, false);
+    storeFrom(loadIntoRegister(s, false), d);
 }
 
 void DecompileASM::moveTempFromAddress(ExprBase* d, ExprBase* s) {
     visitExpr(d);
-    AsmRegister r = loadFromAddress(static_cast<MEM*>(s));
-    line() << "mov ";
-    putOperand(d, false);
-    put(", ");
-    putReg(r);
-    endLine();
-    assignRegister(d, r, false);
+    storeFrom(loadFromAddress(static_cast<MEM*>(s)), d);
 }
 
 void DecompileASM::moveTempFromMem(ExprBase* d, ExprBase* s) {
