@@ -36,8 +36,9 @@ enum class Profile { EXACT, SOUND };
 //    itself still exists; only its nodes are gone.
 //  - A node kept from an earlier unit and put into a later unit's tree is not
 //    detected (a node carries no stamp of its unit): its bytes belong to the
-//    later unit's nodes. The outputs still terminate on such a tree, as on any
-//    pointer graph with cycles, but what they write for it means nothing.
+//    later unit's nodes, and may now form a cycle. The outputs still finish on
+//    such a tree, as on any pointer graph (see below), but what they write for
+//    the stale node means nothing.
 //
 // Output operations write onto the caller's stream and return true (false
 // only for a stale unit, see above):
@@ -58,7 +59,7 @@ enum class Profile { EXACT, SOUND };
 //    string names are addresses ("OFFSET FLAT:sym"), static and extern data
 //    are dword values ("DWORD PTR sym"). A null POINTER constant is 0.
 //  - dumpDot: one Graphviz digraph per subprogram; node statistics go to the
-//    process's standard output. Operators beyond the classic ones are labelled
+//    diagnostic stream. Operators beyond the classic ones are labelled
 //    with their enumerator names ("BITWISE_AND", "CONV4"), a POINTER constant
 //    holding a null pointer with "(char *)0"; null children get no edge.
 //  - dumpAscii: an indented text dump of every subprogram. Every line ends with
@@ -69,6 +70,18 @@ enum class Profile { EXACT, SOUND };
 //    a call with neither name nor pointer shows "Function Pointer: " and an
 //    empty line. An annotation shows as "class " and the qualified name of its
 //    dynamic C++ class (e.g. "class tools::Note"), from run-time type information.
+//
+// Any pointer graph a client can build is written in finite time and stack,
+// including cycles made with the nodes' copy assignments (`*s = SEQ(s, 0)`,
+// `*b = BINOP(INT_S, PLUS, b, y)`). Every walk follows at most MAX_WALK_DEPTH
+// (zoa/nesting.h) levels of children; where a walk reaches that bound the
+// rest of what it was writing for the statement of a label (for the dumps:
+// the subprogram's label) is left out, and the outputs say so with CUT_NOTE:
+// the C inside "/* */" in place of the expression or statement, the assembly
+// on a "# " line, the ASCII dump on a line of its own. The DOT graph leaves
+// the nodes below out. A SEQ that contains itself ends the trace ordering of
+// the label that reached it; every label is still printed. Trees within the
+// bound print whole and exactly as before.
 class ZOA_API ZOA_file {
 public:
     ZOA_file(bool isGcc, bool asmMode);
