@@ -36,8 +36,9 @@ enum class Profile { EXACT, SOUND };
 //    itself still exists; only its nodes are gone.
 //  - A node kept from an earlier unit and put into a later unit's tree is not
 //    detected (a node carries no stamp of its unit): its bytes belong to the
-//    later unit's nodes. The outputs still terminate on such a tree, as on any
-//    pointer graph with cycles, but what they write for it means nothing.
+//    later unit's nodes, and may now form a cycle. The outputs still finish on
+//    such a tree, as on any pointer graph (see below), but what they write for
+//    the stale node means nothing.
 //
 // Output operations write onto the caller's stream and return true (false
 // only for a stale unit, see above):

@@ -1,9 +1,10 @@
-// Broken rules of use: a unit whose arena was rewound under it.
+// Broken rules of use: a unit whose arena was rewound under it, a node kept from an earlier unit.
 #include <zoa/zoa.h>
 
 #include <gtest/gtest.h>
 
 #include <sstream>
+#include <unistd.h>
 
 namespace ZOA {
 namespace {
@@ -56,6 +57,34 @@ TEST(UnitMisuse, ADirectRewindMakesTheUnitStaleToo) {
     EXPECT_FALSE(unit.decompile(out));
     EXPECT_EQ("", out.str());
     EXPECT_NE(std::string::npos, notes.str().find("rewound"));
+}
+
+// A node of an earlier unit lands on the same arena bytes as the node that
+// now refers to it: here a BINOP whose left operand is itself. The outputs
+// must still finish; the alarm turns a hang into a failure.
+TEST(UnitMisuse, ANodeKeptFromAnEarlierUnitDoesNotHangTheOutputs) {
+    BINOP* kept = nullptr;
+    {
+        ZOA_file earlier(true, false);
+        earlier.createSubprog(INT_S, "f", false);
+        CONST* one = new CONST(1);
+        kept = new BINOP(INT_S, PLUS, one, one);
+    }
+    for (bool asmMode : {false, true}) {
+        ZOA_file unit(true, asmMode);
+        std::ostringstream notes, out;
+        unit.setDiagnosticStream(&notes);
+        SUBPROG* f = unit.createSubprog(INT_S, "f", false);
+        CONST* one = new CONST(1);
+        BINOP* sum = new BINOP(INT_S, PLUS, kept, one);
+        ASSERT_EQ(static_cast<ExprBase*>(sum), sum->getLeft()) << "the arena handed out other bytes";
+        f->getStartLabel()->addStmt(new MOVE(f->getReturnTemp(), sum));
+        alarm(20);
+        EXPECT_TRUE(unit.dumpAscii(out));
+        EXPECT_TRUE(unit.dumpDot(out));
+        EXPECT_TRUE(unit.decompile(out));
+        alarm(0);
+    }
 }
 
 }  // namespace
