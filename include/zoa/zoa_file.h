@@ -91,6 +91,12 @@ public:
     NAME* getName(const std::list<ExprBase*>& values);
     NAME* getName(LABEL* l);  // a new LABEL_REF name on every call, not recorded
 
+    // File-level data that is never merged, numbered as getName's names; see
+    // SUBPROG::createData and createZeroData.
+    NAME* createData(const std::list<ExprBase*>& values);
+    NAME* createData(CONST* c);
+    NAME* createZeroData(unsigned int bytes);
+
     // Records a prototype for the called function when no subprogram of the
     // unit has its name (decided now); a later call of the same name replaces
     // it. A call through a pointer goes under the empty name; null is ignored.

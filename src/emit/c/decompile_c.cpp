@@ -2,11 +2,10 @@
 #include "emit/c/decompile_c.h"
 
 #include "emit/c/c_texts.h"
+#include "emit/c/narrow_float.h"
 
 #include <zoa/expr.h>
 
-#include <cfloat>
-#include <cmath>
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
@@ -20,19 +19,9 @@ bool sameText(const String& s, const char* text) {
     return s.size() == n && std::memcmp(s.data(), text, n) == 0;
 }
 
-// The float the stream would see: values beyond the float range round to
-// FLT_MAX or to infinity as the hardware does, without undefined behaviour.
-float narrowToFloat(double v) {
-    double a = std::fabs(v);
-    if (!(a > FLT_MAX)) return static_cast<float>(v);
-    const double halfwayToInfinity = 0x1.ffffffp127;
-    float r = a < halfwayToInfinity ? FLT_MAX : HUGE_VALF;
-    return std::signbit(v) ? -r : r;
-}
-
 }  // namespace
 
-DecompileC::DecompileC(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc), sink(os) {}
+DecompileC::DecompileC(std::ostream& os, bool isGcc, bool sound) : DecompileBase(os, isGcc), sound(sound), sink(os) {}
 DecompileC::~DecompileC() {}
 
 void DecompileC::writeInt(long long v) { sink.writeInt(v); }
@@ -102,6 +91,7 @@ void DecompileC::visit(BUF_TEMP* t) {
 
 void DecompileC::visit(CONST* c) {
     pad(indentLevel);
+    if (sound && writeSoundConst(c)) return;
     long long v = c->getIValue();
     std::uint32_t low = static_cast<std::uint32_t>(v);
     char buf[64];
@@ -155,12 +145,18 @@ void DecompileC::visit(NAME* n) {
         writeUnsigned(n->getId());
         return;
     case SUBPROG_REF:
-        sink << "(void *)" << n->getStringValue();
+        sink << (sound ? "((char *)" : "(void *)") << n->getStringValue();
+        if (sound) sink << ')';
         return;
     case CONST_ARRAY_REF:
     case DATA_ARRAY_REF:
     case STRINGLIT_REF:
-        break;
+        // Sound: a char pointer, so arithmetic on it counts bytes.
+        if (!sound) break;
+        sink << "((char *)";
+        writeDataPrefix(n);
+        sink << ')';
+        return;
     case STATIC_DATA_REF:
         // Made from a constant: no text, defined under its generated name.
         if (n->getStringValue().empty()) break;
@@ -237,6 +233,9 @@ void DecompileC::visit(CALL* c) {
         sink << "))";
         writeOperand(fp);
         sink << ')';
+    } else if (sound) {
+        writeSoundCall(c);
+        return;
     } else {
         const String& name = c->getFunctionName();
         // These two return untyped memory; the cast keeps the C well typed.

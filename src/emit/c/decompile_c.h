@@ -8,6 +8,8 @@
 
 #include <zoa/enums.h>
 
+#include <string>
+
 namespace ZOA {
 
 // Expressions are fully parenthesised; temporaries are "t<id>", labels
@@ -36,9 +38,21 @@ namespace ZOA {
 //  - A missing child (null expression) prints as nothing; a missing jump
 //    target prints ";" in place of its goto. Nothing ever crashes on a broken
 //    tree.
+class CallSignatures;
+struct CallSignature;
+class ZOA_file;
+
+// The sound profile (sound == true) changes only what the exact texts get
+// wrong (decompile_c_sound.cpp): every array-kind data name is written as
+// "((char *)ng<id>)", so address arithmetic on it counts bytes, as in the
+// tree; constants carry what their type needs (ULL, (-9223372036854775807LL
+// - 1), digits that read back to the same bits, __builtin_inf()/nan in the GCC
+// flavour and overflowing constant expressions in the MSVC one); external
+// calls follow CallSignatures; a SUBPROG_REF in an expression is
+// "((char *)<name>)". The unit layout is writeSoundUnit's.
 class DecompileC : public DecompileBase {
 public:
-    DecompileC(std::ostream& os, bool isGcc);
+    DecompileC(std::ostream& os, bool isGcc, bool sound = false);
     ~DecompileC() override;
 
     void visit(UNOP*) override;
@@ -75,6 +89,13 @@ public:
     // A C string literal; a quote is escaped unless a backslash precedes it.
     void writeQuotedString(const String& s);
 
+    // Sound profile: refuses a unit whose names cannot be written (a message
+    // per name on diag, returns false, writes nothing); otherwise writes the
+    // whole unit: the int64/uint64 typedefs (guarded), external function
+    // declarations, every subprogram's prototype, name prototypes, data
+    // definitions, then the subprograms.
+    bool writeSoundUnit(ZOA_file& unit, std::ostream& diag);
+
 private:
     // Prints e with indentLevel 0, restoring the level afterwards.
     void printFlat(ExprBase* e);
@@ -89,10 +110,21 @@ private:
     void writeGoto(LABEL* target, unsigned int level);
     void writeInt(long long v);
     void writeUnsigned(unsigned long long v);
+    // The flavour's alignment request and a blank; nothing for 0.
+    void writeAlignment(unsigned int bytes);
+
+    // Sound profile texts; writeSoundConst is false where the exact text is right.
+    bool writeSoundConst(CONST* c);
+    void writeSoundFloating(double v, bool isFloat);
+    void writeSoundCall(CALL* c);
+    void writeFunctionPointerType(DataType result, CALL* c, const CallSignature* sig);
+    void declareSignature(const std::string& name, const CallSignature& sig);
 
     // Indentation into sink (the base's indent writes to the stream directly).
     TextOut& pad(unsigned int n) { return sink.indent(n); }
 
+    bool sound;
+    const CallSignatures* signatures = nullptr;  // sound profile, set by writeSoundUnit
     UsedTemps usedTemps;  // reused across subprograms
     TextOut sink;     // everything this emitter writes goes through it
 };

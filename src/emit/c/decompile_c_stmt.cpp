@@ -161,11 +161,19 @@ void DecompileC::visit(LABEL* l) {
     }
 }
 
+void DecompileC::writeAlignment(unsigned int bytes) {
+    if (bytes == 0) return;
+    sink << (isGcc ? "__attribute__((aligned(" : "__declspec(align(");
+    writeUnsigned(bytes);
+    sink << (isGcc ? "))) " : ")) ");
+}
+
 void DecompileC::declareTemp(TEMP* t) {
     if (!t) return;
     pad(indentLevel);
     if (t->getNodeType() == BUF_TEMP_NODE) {
         unsigned long long size = static_cast<BUF_TEMP*>(t)->getArraySize();
+        writeAlignment(static_cast<BUF_TEMP*>(t)->getAlignment());
         sink << "char t";
         writeUnsigned(t->getId());
         sink << '[';
@@ -244,12 +252,17 @@ void DecompileC::defineName(NAME* n) {
     case DATA_ARRAY_REF: {
         if (values.empty()) {
             // Nothing to size or type it by: a one-byte array keeps references valid.
-            pad(indentLevel) << "static char ";
+            pad(indentLevel) << "static ";
+            writeAlignment(n->getAlignment());
+            sink << "char ";
             writeDataPrefix(n);
-            sink << "[1];\n";
+            sink << '[';
+            writeUnsigned(n->getZeroBytes() ? n->getZeroBytes() : 1);
+            sink << "];\n";
             return;
         }
         pad(indentLevel) << "static ";
+        writeAlignment(n->getAlignment());
         if (firstValue) writeTypeName(firstValue->getDataType());
         writeDataPrefix(n);
         bool labelTable = firstValue && firstValue->getNodeType() == NAME_NODE &&
@@ -299,6 +312,7 @@ void DecompileC::defineName(NAME* n) {
         return;
     case STATIC_DATA_REF:
         pad(indentLevel) << "static ";
+        writeAlignment(n->getAlignment());
         writeTypeName(n->getDataType());
         if (!firstValue) {
             // Made from a text: defined under the name references print.
