@@ -26,6 +26,7 @@ const LibraryType L_CSTR{"const char *", POINTER};
 const LibraryFunction LIBRARY[] = {
     {"abort", L_VOID, {}, false},
     {"abs", L_INT, {L_INT}, false},
+    {"alloca", L_PTR, {L_SIZE}, false},
     {"atoi", L_INT, {L_CSTR}, false},
     {"calloc", L_PTR, {L_SIZE, L_SIZE}, false},
     {"ceil", L_DOUBLE, {L_DOUBLE}, false},
@@ -59,15 +60,6 @@ const LibraryFunction LIBRARY[] = {
     {"strncpy", L_STR, {L_STR, L_CSTR, L_SIZE}, false},
 };
 
-bool isNumber(DataType t) { return isIntegerType(t) || isFloatingType(t); }
-
-// A value of type `arg` passed for a parameter of type `param` converts
-// without a diagnostic.
-bool converts(DataType arg, DataType param) {
-    if (param == POINTER) return arg == POINTER;
-    return isNumber(param) && isNumber(arg);
-}
-
 CallSignature librarySignature(const LibraryFunction* f) {
     CallSignature s;
     s.library = f;
@@ -91,21 +83,15 @@ const CallSignature* CallSignatures::find(std::string_view name) const {
 }
 
 bool CallSignatures::fits(const CallSignature& sig, CALL* c) {
-    const auto& args = c->getArgs();
-    if (args.size() < sig.params.size() || (!sig.variadic && args.size() != sig.params.size())) return false;
-    std::size_t i = 0;
-    for (ExprBase* a : args) {
-        if (i == sig.params.size()) break;
-        if (!a || !converts(a->getDataType(), sig.params[i])) return false;
-        ++i;
-    }
-    if (!sig.library) return c->getDataType() == sig.returnType;
+    std::size_t n = c->getArgs().size();
+    if (n < sig.params.size() || (!sig.variadic && n != sig.params.size())) return false;
+    if (!sig.library && !sig.defined) return c->getDataType() == sig.returnType;
     return sig.returnType != VOID || c->getDataType() == VOID;
 }
 
 bool CallSignatures::needsResultCast(const CallSignature& sig, CALL* c) {
-    if (!sig.library || c->getDataType() == VOID || sig.returnType == VOID) return false;
-    return sig.library->result.type != c->getDataType() || c->getDataType() == POINTER;
+    if ((!sig.library && !sig.defined) || c->getDataType() == VOID || sig.returnType == VOID) return false;
+    return sig.returnType != c->getDataType() || (sig.library && c->getDataType() == POINTER);
 }
 
 void CallSignatures::add(CALL* c) {
@@ -121,12 +107,11 @@ void CallSignatures::add(CALL* c) {
             s.returnType = c->getDataType();
             for (ExprBase* a : c->getArgs()) s.params.push_back(a ? a->getDataType() : VOID);
         }
-        s.isStatic = c->isCallStatic();
         signatures.emplace(std::string(key), std::move(s));
         return;
     }
     CallSignature& s = it->second;
-    if (s.library) return;
+    if (s.library || s.defined) return;
     // Keep the leading parameters every call agrees on.
     std::size_t n = 0;
     for (ExprBase* a : c->getArgs()) {
@@ -139,20 +124,29 @@ void CallSignatures::add(CALL* c) {
     }
 }
 
-void CallSignatures::decide(ZOA_file& unit) {
+void CallSignatures::decide(ZOA_file& unit, const std::function<void(TreeBase*)>& each) {
     signatures.clear();
     seen.clear();
+    for (SUBPROG* sp : unit.getSubprogs()) {
+        if (!sp) continue;
+        CallSignature s;
+        s.defined = true;
+        s.returnType = sp->getReturnType();
+        for (TEMP* t : sp->getAllArgTemps()) s.params.push_back(t ? t->getDataType() : VOID);
+        signatures.emplace(std::string(sp->getName().data(), sp->getName().size()), std::move(s));
+    }
     std::vector<TreeBase*> todo;
+    std::vector<TreeBase*> kids;
     for (SUBPROG* sp : unit.getSubprogs()) {
         if (sp) todo.push_back(sp);
-        // Children are pushed in reverse, so calls are met in walk order.
-        std::vector<TreeBase*> kids;
         while (!todo.empty()) {
             TreeBase* n = todo.back();
             todo.pop_back();
             if (seen.contains(n)) continue;
             seen.assign(n, n->getNodeType());
+            if (each) each(n);
             if (n->getNodeType() == CALL_NODE) add(static_cast<CALL*>(n));
+            // Children go on the stack in reverse, so calls are met in walk order.
             kids.clear();
             forEachChild(n, [&kids](TreeBase* k) { kids.push_back(k); });
             todo.insert(todo.end(), kids.rbegin(), kids.rend());
@@ -160,12 +154,6 @@ void CallSignatures::decide(ZOA_file& unit) {
     }
     for (auto& entry : unit.getCallPrototypes())
         if (entry.second && !seen.contains(entry.second)) add(entry.second);
-    // Calls of the unit's own subprograms are declared by their prototypes.
-    for (SUBPROG* sp : unit.getSubprogs()) {
-        if (!sp) continue;
-        auto it = signatures.find(std::string_view(sp->getName().data(), sp->getName().size()));
-        if (it != signatures.end()) signatures.erase(it);
-    }
     for (auto& entry : unit.getNamePrototypes()) {
         const LibraryFunction* f = libraryFunction(entry.first);
         if (f && !find(entry.first)) signatures.emplace(entry.first, librarySignature(f));

@@ -6,6 +6,7 @@
 
 #include <zoa/enums.h>
 
+#include <functional>
 #include <map>
 #include <string>
 #include <string_view>
@@ -14,6 +15,7 @@
 namespace ZOA {
 
 class CALL;
+class TreeBase;
 class ZOA_file;
 
 // A parameter or return type of a known C library function, as its header
@@ -33,46 +35,48 @@ struct LibraryFunction {
     bool variadic;
 };
 
-// The declaration of one external function.
+// How the calls of one named function are made.
+//  - A subprogram of the unit (`defined`): its return and argument temporary
+//    types.
 //  - A known C library function is declared as its header does (`library`).
 //  - Otherwise, when every call has the same argument types, a plain prototype
 //    of those types; when calls disagree, a variadic declaration whose fixed
 //    part is the longest run of leading argument types all calls share (no
 //    fixed part: the old-style "()" declaration, which passes arguments the
-//    same way). Arguments past the fixed part get C's default promotions:
-//    FLOAT goes as DOUBLE, CHAR_U and CHAR_S as INT_S.
-//  - The return type is that of the first call found (the walk goes through
-//    the subprograms in order, then the registered prototypes); a call of
-//    another type, or one that does not fit the declaration (fits() false),
-//    is made through a function pointer of its own type, its arguments passed
-//    as they are.
+//    same way). The return type is that of the first call found (the walk
+//    goes through the subprograms in order, then the registered prototypes).
+// A call that fits (fits()) passes each fixed argument converted to its
+// parameter's type and the rest with C's default promotions (FLOAT as DOUBLE,
+// CHAR_U and CHAR_S as INT_S); its value is converted to the call's type
+// (needsResultCast()). A call that does not fit (another argument count, or
+// another return type where the real one is unknown) is made through a
+// function pointer of its own type, its arguments passed as they are.
 struct CallSignature {
     DataType returnType = VOID;
     std::vector<DataType> params;
     bool variadic = false;
-    bool isStatic = false;
+    bool defined = false;
     const LibraryFunction* library = nullptr;
 };
 
 class CallSignatures {
 public:
-    // Every named call of the unit's subprograms and registered prototypes
-    // whose callee is not a subprogram of the unit, and every external
-    // function a SUBPROG_REF name prototype refers to (those get the library
-    // declaration when known, else no entry).
-    void decide(ZOA_file& unit);
+    // Every subprogram of the unit, the callee of every named call of its
+    // subprograms and registered prototypes, and every C library function a
+    // SUBPROG_REF name prototype refers to.
+    // `each`, when given, sees every node of the subprograms once.
+    void decide(ZOA_file& unit, const std::function<void(TreeBase*)>& each = {});
     void clear() { signatures.clear(); }
 
     const CallSignature* find(std::string_view name) const;
     const std::map<std::string, CallSignature, std::less<>>& all() const { return signatures; }
 
-    // True when c passes its arguments as sig declares them: its argument
-    // count fits, each fixed argument converts to its parameter without a
-    // diagnostic (pointers to pointers, numbers to numbers), and a non-VOID
-    // call does not call a void function.
+    // True when c can be made as sig declares the function: its argument count
+    // fits, and its type is the declared one or, where the real return type is
+    // known (defined or library), either VOID or a value the function returns.
     static bool fits(const CallSignature& sig, CALL* c);
-    // True when c's value must be cast to c's own type: the declared return
-    // type writes another C type.
+    // True when c's value must be converted to c's own type: the real return
+    // type is known and writes another C type.
     static bool needsResultCast(const CallSignature& sig, CALL* c);
     static const LibraryFunction* libraryFunction(std::string_view name);
 

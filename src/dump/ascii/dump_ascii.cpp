@@ -6,7 +6,9 @@
 namespace ZOA {
 
 bool ZOA_file::dumpAscii(std::ostream& os) {
-    for (SUBPROG* sp : subprogs) DumpTree(sp, os, true);
+    StableIds ids;
+    StableIds* stable = profile == Profile::SOUND ? &ids : nullptr;
+    for (SUBPROG* sp : subprogs) DumpTree(sp, os, true, stable);
     return true;
 }
 

@@ -2,6 +2,8 @@
 #ifndef ZOA_DUMP_ASCII_DUMP_TREE_H
 #define ZOA_DUMP_ASCII_DUMP_TREE_H
 
+#include "dump/stable_ids.h"
+
 #include <zoa/subprog.h>
 #include <zoa/tree_base.h>
 #include <zoa/visitor.h>
@@ -40,7 +42,10 @@ namespace ZOA {
 //  - A root whose kind is one of the base kinds, or unknown, writes nothing.
 class DumpTree : public VisitorBase {
 public:
-    DumpTree(TreeBase* node, std::ostream& out, bool recursive);
+    // With ids (the sound profile), nodes and annotations are identified by
+    // "@" and their number in order of first appearance (shared by the dumps
+    // that get the same ids), a null one by "0", instead of by address.
+    DumpTree(TreeBase* node, std::ostream& out, bool recursive, StableIds* ids = nullptr);
     ~DumpTree() override;
 
     void visit(UNOP*) override;
@@ -68,6 +73,8 @@ private:
     void writeNodeHeader(TreeBase* node);
     // An identity line: label (ending in "("), the address, ")".
     void writeRef(const char* label, const void* node);
+    // A node's identity: its address, or its stable number.
+    void writeId(const void* node);
     template <class List> void writeList(const char* label, const List& nodes);
     void writeTempFields(TEMP* t);
     void endBlock();
@@ -81,6 +88,7 @@ private:
     TreeBase* root;
     std::ostream& out;
     bool recursive;
+    StableIds* ids;
     // Labels whose first statement is being dumped on the current path.
     std::vector<LABEL*> labelPath;
     // Demangled "class ..." names, one per annotation type met.

@@ -1,6 +1,8 @@
 // DumpDot and ZOA_file::dumpDot: Graphviz digraphs of subprograms, node statistics on the diagnostic stream.
 #include "dump/dot/dump_dot.h"
 
+#include "dump/dot/dot_escape.h"
+
 #include <zoa/expr.h>
 #include <zoa/stmt.h>
 #include <zoa/subprog.h>
@@ -85,7 +87,7 @@ void putView(TextBuffer& text, std::string_view v) { text.append(v.data(), v.siz
 
 }  // namespace
 
-DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws, std::ostream* stats)
+DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws, std::ostream* stats, bool sound)
     : AllVisitor(sp),
       ownWorkspace(ws ? nullptr : new Workspace),
       workspace(ws ? *ws : *ownWorkspace),
@@ -93,8 +95,10 @@ DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws, std::ostream* sta
       text(workspace.text),
       subprog(sp),
       out(os),
-      plainNumbers(formatsPlainDecimal(os)) {
+      plainNumbers(formatsPlainDecimal(os)),
+      sound(sound) {
     for (int k = 0; k < NODE_TYPE_COUNT; ++k) nodesByKind[k].clear();
+    workspace.ids.clear();
     workspace.declaredOnce.clear();
     text.clear();
     if (!subprog) return;
@@ -167,7 +171,7 @@ void DumpDot::writeGraphHeader() {
     indent(1);
     lit("graph [fontname=\"Helvetica\", fontsize=20,");
     lit(" label = \"");
-    put(subprog->getName());
+    putText(subprog->getName(), false);
     lit("\"]\n");
 }
 
@@ -227,7 +231,7 @@ void DumpDot::writeFields(TreeBase* n) {
             lit(" | (");
             putCString(toString(c->getDataType()));
             lit(" / ");
-            put(c->getFunctionName());
+            putText(c->getFunctionName());
             lit(")");
             break;
         }
@@ -283,7 +287,7 @@ void DumpDot::writeFields(TreeBase* n) {
             lit(" | (");
             putCString(toString(sp->getReturnType()));
             lit(" / ");
-            put(sp->getName());
+            putText(sp->getName());
             lit(")");
             break;
         }
@@ -302,7 +306,8 @@ void DumpDot::writeFields(TreeBase* n) {
 void DumpDot::writeConstValue(CONST* c) {
     switch (c->getDataType()) {
         case CHAR_U:
-            text.push_back(static_cast<char>(static_cast<unsigned long long>(c->getIValue()) & 0xffu));
+            if (sound) putUnsigned(static_cast<unsigned long long>(c->getIValue()) & 0xffu);
+            else text.push_back(static_cast<char>(static_cast<unsigned long long>(c->getIValue()) & 0xffu));
             break;
         case INT_U:
             putUnsigned(static_cast<unsigned long long>(c->getIValue()) & 0xffffffffu);
@@ -323,7 +328,9 @@ void DumpDot::writeConstValue(CONST* c) {
             break;
         case POINTER: {
             const char* s = static_cast<const char*>(c->getPValue());
-            putCString(s ? s : "(char *)0");
+            if (!s) s = "(char *)0";
+            if (sound) putText(s, std::strlen(s));
+            else putCString(s);
             break;
         }
         case VOID:
@@ -462,7 +469,16 @@ void DumpDot::putSigned(long long v) {
     text.commit(static_cast<std::size_t>(std::to_chars(at, at + 24, v).ptr - at));
 }
 
+void DumpDot::putText(const char* s, std::size_t n, bool record) {
+    if (sound) appendDotEscaped(text, s, n, record);
+    else text.append(s, n);
+}
+
 void DumpDot::putIdentity(const TreeBase* n) {
+    if (sound) {
+        putUnsigned(workspace.ids.of(n));
+        return;
+    }
     putUnsigned(static_cast<unsigned long long>(reinterpret_cast<std::uintptr_t>(n)));
 }
 
@@ -480,7 +496,7 @@ void DumpDot::flushText() {
 
 bool ZOA_file::dumpDot(std::ostream& os) {
     DumpDot::Workspace workspace;
-    for (SUBPROG* sp : subprogs) DumpDot dump(sp, os, &workspace, &getDiagnosticStream());
+    for (SUBPROG* sp : subprogs) DumpDot dump(sp, os, &workspace, &getDiagnosticStream(), profile == Profile::SOUND);
     return true;
 }
 

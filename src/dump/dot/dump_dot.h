@@ -3,6 +3,7 @@
 #define ZOA_DUMP_DOT_DUMP_DOT_H
 
 #include "dump/dot/node_set.h"
+#include "dump/stable_ids.h"
 #include "dump/text_buffer.h"
 
 #include <zoa/all_visitor.h>
@@ -43,10 +44,16 @@ public:
         std::vector<TreeBase*> nodesByKind[NODE_TYPE_COUNT];
         NodeSet declaredOnce;
         TextBuffer text;  // DOT text not yet handed to the stream
+        StableIds ids;    // sound profile identities
     };
 
-    // The node statistics go to `stats`, std::cout when it is null.
-    DumpDot(SUBPROG* subprog, std::ostream& out, Workspace* workspace = nullptr, std::ostream* stats = nullptr);
+    // The node statistics go to `stats`, std::cout when it is null. With
+    // sound (the sound profile) node identities are numbers in order of first
+    // appearance in the digraph, not addresses; names, call names and string
+    // constants are escaped (dot_escape.h) and a CHAR_U constant shows its
+    // value in decimal, so that Graphviz renders every digraph.
+    DumpDot(SUBPROG* subprog, std::ostream& out, Workspace* workspace = nullptr, std::ostream* stats = nullptr,
+            bool sound = false);
     ~DumpDot() override;
 
     void visit(UNOP* n) override;
@@ -89,6 +96,9 @@ private:
     void put(const char* s, std::size_t n) { text.append(s, n); }
     template <std::size_t N> void lit(const char (&s)[N]) { text.append(s, N - 1); }
     void put(const String& s) { text.append(s.data(), s.size()); }
+    // A user text inside a label: escaped in the sound profile.
+    void putText(const char* s, std::size_t n, bool record = true);
+    void putText(const String& s, bool record = true) { putText(s.data(), s.size(), record); }
     void putCString(const char* s);
     void indent(int depth);
     void putUnsigned(unsigned long long v);
@@ -104,6 +114,7 @@ private:
     SUBPROG* subprog;
     std::ostream& out;
     bool plainNumbers;  // out formats integers as bare decimal digits
+    bool sound;
 };
 
 }  // namespace ZOA

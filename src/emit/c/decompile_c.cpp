@@ -212,12 +212,13 @@ void DecompileC::writeArgTypes(CALL* c) {
     }
 }
 
-void DecompileC::writeArgList(CALL* c) {
+void DecompileC::writeArgList(CALL* c, const std::vector<DataType>* params) {
     sink << '(';
-    bool first = true;
+    std::size_t i = 0;
     for (ExprBase* a : c->getArgs()) {
-        if (!first) sink << ", ";
-        first = false;
+        if (i != 0) sink << ", ";
+        if (params && i < params->size()) writeSoundCast((*params)[i], a);
+        ++i;
         printFlat(a);
     }
     sink << ')';

@@ -9,6 +9,7 @@
 #include <zoa/enums.h>
 
 #include <string>
+#include <vector>
 
 namespace ZOA {
 
@@ -104,7 +105,9 @@ private:
     // Prints a statement or label, keeping indentLevel as it was.
     void printStmt(StmtBase* s);
     void printLabel(LABEL* l);
-    void writeArgList(CALL* c);
+    // With params (sound profile), each argument that has a parameter is
+    // converted to its type.
+    void writeArgList(CALL* c, const std::vector<DataType>* params = nullptr);
     void writeArgTypes(CALL* c);
     void writeDataPrefix(NAME* n);
     void writeGoto(LABEL* target, unsigned int level);
@@ -115,6 +118,8 @@ private:
 
     // Sound profile texts; writeSoundConst is false where the exact text is right.
     bool writeSoundConst(CONST* c);
+    // "(<type>)" before e where e's C type may differ from `to`.
+    void writeSoundCast(DataType to, ExprBase* e);
     void writeSoundFloating(double v, bool isFloat);
     void writeSoundCall(CALL* c);
     void writeFunctionPointerType(DataType result, CALL* c, const CallSignature* sig);

@@ -2,6 +2,7 @@
 #include "emit/c/decompile_c.h"
 
 #include "core/identifiers.h"
+#include "emit/c/c_texts.h"
 #include "emit/c/narrow_float.h"
 #include "emit/call_signatures.h"
 
@@ -15,7 +16,6 @@
 #include <cstring>
 #include <map>
 #include <ostream>
-#include <set>
 #include <string_view>
 
 namespace ZOA {
@@ -62,6 +62,10 @@ public:
         for (NAME* n : l) name(n);
     }
     bool ok() const { return !failed; }
+    void fail(const char* why) {
+        diag << "error: sound C: " << why << "\n";
+        failed = true;
+    }
 
 private:
     void name(NAME* n) {
@@ -135,6 +139,18 @@ void DecompileC::writeSoundFloating(double v, bool isFloat) {
     if (negative) sink << ')';
 }
 
+void DecompileC::writeSoundCast(DataType to, ExprBase* e) {
+    if (!e || to == VOID) return;
+    NodeType k = e->getNodeType();
+    // These have exactly their DataType as their C type.
+    if ((k == TEMP_NODE || k == CONST_NODE || k == MEM_NODE) && e->getDataType() == to) return;
+    // For scalars a cast converts as assignment does, and also between
+    // pointers and integers, which assignment refuses.
+    std::string_view name = ctext::typeName(to);
+    if (!name.empty() && name.back() == ' ') name.remove_suffix(1);
+    sink << '(' << name << ')';
+}
+
 bool DecompileC::writeSoundConst(CONST* c) {
     long long v = c->getIValue();
     std::uint32_t low = static_cast<std::uint32_t>(v);
@@ -193,7 +209,7 @@ void DecompileC::writeSoundCall(CALL* c) {
         sink << ')';
     }
     sink << name;
-    writeArgList(c);
+    writeArgList(c, sig ? &sig->params : nullptr);
     if (cast) sink << ')';
 }
 
@@ -211,7 +227,7 @@ void DecompileC::declareSignature(const std::string& name, const CallSignature& 
         sink << ");\n";
         return;
     }
-    // No "static": the function is not defined in this unit.
+    // No "static", whatever the calls say: the function is not defined here.
     writeTypeName(sig.returnType);
     sink << name << '(';
     bool first = true;
@@ -226,13 +242,17 @@ void DecompileC::declareSignature(const std::string& name, const CallSignature& 
 }
 
 bool DecompileC::writeSoundUnit(ZOA_file& unit, std::ostream& diag) {
-    CallSignatures sigs;
-    sigs.decide(unit);
-
     NameCheck check(diag);
+    CallSignatures sigs;
+    sigs.decide(unit, [&check](TreeBase* n) {
+        if (n->getNodeType() != CONST_NODE) return;
+        CONST* c = static_cast<CONST*>(n);
+        if (c->getDataType() == POINTER && c->getPValue()) check.fail("a POINTER constant holds C text, which means nothing here");
+    });
     for (SUBPROG* sp : unit.getSubprogs())
         if (sp) check.function(view(sp->getName()), true);
-    for (auto& entry : sigs.all()) check.function(entry.first, false);
+    for (auto& entry : sigs.all())
+        if (!entry.second.defined) check.function(entry.first, false);
     for (auto& entry : unit.getNamePrototypes()) check.function(entry.first, false);
     check.names(unit.getNames());
     for (SUBPROG* sp : unit.getSubprogs())
@@ -243,14 +263,15 @@ bool DecompileC::writeSoundUnit(ZOA_file& unit, std::ostream& diag) {
     signatures = &sigs;
     sink << "#ifndef ZOA_INT64_TYPES\n#define ZOA_INT64_TYPES\n"
             "typedef long long int64;\ntypedef unsigned long long uint64;\n#endif\n\n";
+    // The tree gives main the parameters it likes.
+    const CallSignature* mainSig = sigs.find("main");
+    if (isGcc && mainSig && mainSig->defined) sink << "#pragma GCC diagnostic ignored \"-Wmain\"\n\n";
     // Every function is declared before any data, so tables can hold their addresses.
-    for (auto& entry : sigs.all()) declareSignature(entry.first, entry.second);
+    for (auto& entry : sigs.all())
+        if (!entry.second.defined) declareSignature(entry.first, entry.second);
     for (SUBPROG* sp : unit.getSubprogs()) declareSubprogPrototype(sp);
-    std::set<std::string_view> defined;
-    for (SUBPROG* sp : unit.getSubprogs())
-        if (sp) defined.insert(view(sp->getName()));
     for (auto& entry : unit.getNamePrototypes())
-        if (!defined.count(entry.first) && !sigs.find(entry.first)) declareNamePrototype(entry.second);
+        if (!sigs.find(entry.first)) declareNamePrototype(entry.second);
     sink << '\n';
     for (NAME* n : unit.getNames()) defineName(n);
     sink << '\n';

@@ -1,6 +1,8 @@
 // DecompileC: statements, labels, subprograms, data definitions and prototypes.
 #include "emit/c/decompile_c.h"
 
+#include "core/string_text.h"
+
 #include <zoa/expr.h>
 #include <zoa/stmt.h>
 #include <zoa/subprog.h>
@@ -50,7 +52,10 @@ void DecompileC::writeGoto(LABEL* target, unsigned int level) {
 }
 
 void DecompileC::visit(EXP* e) {
-    if (ExprBase* x = e->getExpr()) x->accept(this);
+    ExprBase* x = e->getExpr();
+    // Sound: a value computed for nothing is no warning.
+    if (sound && x && x->getNodeType() != CALL_NODE) pad(indentLevel) << "(void)";
+    if (x) x->accept(this);
     sink << ";\n";
 }
 
@@ -87,7 +92,8 @@ void DecompileC::visit(MOVE* m) {
         indentLevel = saved;
     }
     sink << " = ";
-    if (needsCharPointerCast(src)) sink << "(char *)";
+    if (sound && dst) writeSoundCast(dst->getDataType(), src);
+    else if (needsCharPointerCast(src)) sink << "(char *)";
     printFlat(src);
     sink << ";\n";
 }
@@ -131,9 +137,15 @@ void DecompileC::visit(JUMP* j) {
 
 void DecompileC::visit(CJUMP* c) {
     pad(indentLevel) << "if (";
-    printFlat(c->getLeft());
+    // Sound: a pointer compared with a number compares their bits.
+    ExprBase* l = c->getLeft();
+    ExprBase* r = c->getRight();
+    bool mixed = sound && l && r && (l->getDataType() == POINTER) != (r->getDataType() == POINTER);
+    if (mixed) writeSoundCast(INT_U, l);
+    printFlat(l);
     writeBinopText(c->getRelOp());
-    printFlat(c->getRight());
+    if (mixed) writeSoundCast(INT_U, r);
+    printFlat(r);
     sink << ")\n";
     writeGoto(c->getIfTrue(), indentLevel + 1);
     if (fallsThrough(c)) return;
@@ -229,6 +241,10 @@ void DecompileC::printLabel(LABEL* l) {
 }
 
 void DecompileC::writeQuotedString(const String& s) {
+    if (sound) {
+        sink << quoteCString(decodeStringText(s.data(), s.size()));
+        return;
+    }
     sink << '"';
     const char* p = s.data();
     std::size_t n = s.size();
@@ -296,6 +312,8 @@ void DecompileC::defineName(NAME* n) {
             if (!first) sink << ", ";
             first = false;
             NameKind k = e && e->getNodeType() == NAME_NODE ? static_cast<NAME*>(e)->getKind() : LABEL_REF;
+            if (sound && firstValue && !(e && e->getNodeType() == NAME_NODE && firstValue->getDataType() == POINTER))
+                writeSoundCast(firstValue->getDataType(), e);
             if (k == SUBPROG_REF) sink << "(void *)" << static_cast<NAME*>(e)->getStringValue();
             else if (k == STRINGLIT_REF) writeQuotedString(static_cast<NAME*>(e)->getStringValue());
             else printFlat(e);
@@ -358,7 +376,10 @@ void DecompileC::declareSubprogPrototype(SUBPROG* sp) {
         first = false;
         if (t) writeTypeName(t->getDataType());
     }
-    sink << ");\n";
+    sink << ')';
+    // A static function nothing calls is no error in the sound text.
+    if (sound && isGcc && sp->isStatic()) sink << " __attribute__((unused))";
+    sink << ";\n";
 }
 
 void DecompileC::declareNamePrototype(NAME* n) {
