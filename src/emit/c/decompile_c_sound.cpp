@@ -2,8 +2,8 @@
 #include "emit/c/decompile_c.h"
 
 #include "core/identifiers.h"
+#include "emit/c/c_rules.h"
 #include "emit/c/c_texts.h"
-#include "emit/c/narrow_float.h"
 #include "emit/call_signatures.h"
 
 #include <zoa/expr.h>
@@ -172,7 +172,7 @@ bool DecompileC::writeSoundConst(CONST* c) {
         writeInt(v);
         sink << "LL";
         return true;
-    case FLOAT: writeSoundFloating(static_cast<double>(narrowToFloat(c->getFValue())), true); return true;
+    case FLOAT: writeSoundFloating(static_cast<double>(ctext::narrowToFloat(c->getFValue())), true); return true;
     case DOUBLE: writeSoundFloating(c->getFValue(), false); return true;
     case CHAR_U:
     case INT_U:
