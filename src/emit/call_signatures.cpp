@@ -85,8 +85,7 @@ const CallSignature* CallSignatures::find(std::string_view name) const {
 bool CallSignatures::fits(const CallSignature& sig, CALL* c) {
     std::size_t n = c->getArgs().size();
     if (n < sig.params.size() || (!sig.variadic && n != sig.params.size())) return false;
-    if (!sig.library && !sig.defined) return c->getDataType() == sig.returnType;
-    return sig.returnType != VOID || c->getDataType() == VOID;
+    return sig.library || sig.defined || c->getDataType() == sig.returnType;
 }
 
 bool CallSignatures::needsResultCast(const CallSignature& sig, CALL* c) {
@@ -107,25 +106,26 @@ void CallSignatures::add(CALL* c) {
             s.returnType = c->getDataType();
             for (ExprBase* a : c->getArgs()) s.params.push_back(a ? a->getDataType() : VOID);
         }
-        signatures.emplace(std::string(key), std::move(s));
-        return;
+        it = signatures.emplace(std::string(key), std::move(s)).first;
+    } else if (!it->second.library && !it->second.defined) {
+        // Keep the leading parameters every call agrees on.
+        CallSignature& s = it->second;
+        std::size_t n = 0;
+        for (ExprBase* a : c->getArgs()) {
+            if (n == s.params.size() || (a ? a->getDataType() : VOID) != s.params[n]) break;
+            ++n;
+        }
+        if (n != s.params.size() || n != c->getArgs().size()) {
+            s.params.resize(n);
+            s.variadic = true;
+        }
     }
-    CallSignature& s = it->second;
-    if (s.library || s.defined) return;
-    // Keep the leading parameters every call agrees on.
-    std::size_t n = 0;
-    for (ExprBase* a : c->getArgs()) {
-        if (n == s.params.size() || (a ? a->getDataType() : VOID) != s.params[n]) break;
-        ++n;
-    }
-    if (n != s.params.size() || n != c->getArgs().size()) {
-        s.params.resize(n);
-        s.variadic = true;
-    }
+    if (!fits(it->second, c)) misfitCalls.push_back(c);
 }
 
 void CallSignatures::decide(ZOA_file& unit, const std::function<void(TreeBase*)>& each) {
     signatures.clear();
+    misfitCalls.clear();
     seen.clear();
     for (SUBPROG* sp : unit.getSubprogs()) {
         if (!sp) continue;

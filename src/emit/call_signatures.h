@@ -48,9 +48,11 @@ struct LibraryFunction {
 // A call that fits (fits()) passes each fixed argument converted to its
 // parameter's type and the rest with C's default promotions (FLOAT as DOUBLE,
 // CHAR_U and CHAR_S as INT_S); its value is converted to the call's type
-// (needsResultCast()). A call that does not fit (another argument count, or
-// another return type where the real one is unknown) is made through a
-// function pointer of its own type, its arguments passed as they are.
+// (needsResultCast()); a call that wants a value of a VOID function gets 0 of
+// its type. Calls that do not fit (another argument count than a defined or
+// library function takes, or, for an external function, another return type
+// than the first call's) are listed in misfits(): C cannot make them (GCC
+// refuses calls through a cast of a known function), so outputs refuse them.
 struct CallSignature {
     DataType returnType = VOID;
     std::vector<DataType> params;
@@ -71,18 +73,19 @@ public:
     const CallSignature* find(std::string_view name) const;
     const std::map<std::string, CallSignature, std::less<>>& all() const { return signatures; }
 
-    // True when c can be made as sig declares the function: its argument count
-    // fits, and its type is the declared one or, where the real return type is
-    // known (defined or library), either VOID or a value the function returns.
+    // True when c can be made as sig declares the function.
     static bool fits(const CallSignature& sig, CALL* c);
     // True when c's value must be converted to c's own type: the real return
     // type is known and writes another C type.
     static bool needsResultCast(const CallSignature& sig, CALL* c);
+    // The calls that do not fit their function's signature, in walk order.
+    const std::vector<CALL*>& misfits() const { return misfitCalls; }
     static const LibraryFunction* libraryFunction(std::string_view name);
 
 private:
     void add(CALL* c);
     std::map<std::string, CallSignature, std::less<>> signatures;
+    std::vector<CALL*> misfitCalls;
     UsedMap seen;  // reused across units
 };
 

@@ -120,9 +120,13 @@ private:
     bool writeSoundConst(CONST* c);
     // "(<type>)" before e where e's C type may differ from `to`.
     void writeSoundCast(DataType to, ExprBase* e);
+    // A discarded library result needs "(void)!": GCC's malloc and others
+    // warn about "(void)" alone.
+    bool discardNeedsNot(ExprBase* x) const;
+    // "(int)", "(char *)": a cast to the type.
+    void writeCast(DataType to);
     void writeSoundFloating(double v, bool isFloat);
     void writeSoundCall(CALL* c);
-    void writeFunctionPointerType(DataType result, CALL* c, const CallSignature* sig);
     void declareSignature(const std::string& name, const CallSignature& sig);
 
     // Indentation into sink (the base's indent writes to the stream directly).

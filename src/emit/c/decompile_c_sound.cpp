@@ -139,16 +139,21 @@ void DecompileC::writeSoundFloating(double v, bool isFloat) {
     if (negative) sink << ')';
 }
 
+void DecompileC::writeCast(DataType to) {
+    std::string_view name = ctext::typeName(to);
+    if (!name.empty() && name.back() == ' ') name.remove_suffix(1);
+    sink << '(' << name << ')';
+}
+
 void DecompileC::writeSoundCast(DataType to, ExprBase* e) {
     if (!e || to == VOID) return;
     NodeType k = e->getNodeType();
     // These have exactly their DataType as their C type.
     if ((k == TEMP_NODE || k == CONST_NODE || k == MEM_NODE) && e->getDataType() == to) return;
+    if (to == POINTER && ctext::isArrayName(e)) return;  // written as a char pointer
     // For scalars a cast converts as assignment does, and also between
     // pointers and integers, which assignment refuses.
-    std::string_view name = ctext::typeName(to);
-    if (!name.empty() && name.back() == ' ') name.remove_suffix(1);
-    sink << '(' << name << ')';
+    writeCast(to);
 }
 
 bool DecompileC::writeSoundConst(CONST* c) {
@@ -183,34 +188,30 @@ bool DecompileC::writeSoundConst(CONST* c) {
     return false;  // the exact text means the value
 }
 
-void DecompileC::writeFunctionPointerType(DataType result, CALL* c, const CallSignature*) {
-    sink << "((";
-    writeTypeName(result);
-    sink << " (*)(";
-    if (c->getArgs().empty()) sink << "void";
-    writeArgTypes(c);
-    sink << "))";
+bool DecompileC::discardNeedsNot(ExprBase* x) const {
+    if (!signatures || x->getNodeType() != CALL_NODE) return false;
+    CALL* c = static_cast<CALL*>(x);
+    if (c->getFunctionPointer()) return false;
+    const CallSignature* sig = signatures->find(view(c->getFunctionName()));
+    return sig && sig->library && sig->returnType != VOID;
 }
 
 void DecompileC::writeSoundCall(CALL* c) {
     const String& name = c->getFunctionName();
     const CallSignature* sig = signatures ? signatures->find(view(name)) : nullptr;
-    if (sig && !CallSignatures::fits(*sig, c)) {
-        // Called the way this call passes its arguments.
-        writeFunctionPointerType(c->getDataType(), c, sig);
-        sink << name << ')';
-        writeArgList(c);
-        return;
-    }
+    // A value wanted of a void function: 0 of the call's type.
+    bool voidValue = sig && sig->returnType == VOID && c->getDataType() != VOID;
     bool cast = sig && CallSignatures::needsResultCast(*sig, c);
-    if (cast) {
-        sink << "((";
-        writeTypeName(c->getDataType());
-        sink << ')';
-    }
+    if (voidValue || cast) sink << '(';
+    if (cast) writeCast(c->getDataType());
     sink << name;
     writeArgList(c, sig ? &sig->params : nullptr);
-    if (cast) sink << ')';
+    if (voidValue) {
+        sink << ", ";
+        writeCast(c->getDataType());
+        sink << '0';
+    }
+    if (voidValue || cast) sink << ')';
 }
 
 void DecompileC::declareSignature(const std::string& name, const CallSignature& sig) {
@@ -257,6 +258,12 @@ bool DecompileC::writeSoundUnit(ZOA_file& unit, std::ostream& diag) {
     check.names(unit.getNames());
     for (SUBPROG* sp : unit.getSubprogs())
         if (sp) check.names(sp->getAllLocalNames());
+    for (CALL* c : sigs.misfits()) {
+        std::string why = "a call of '" + std::string(view(c->getFunctionName())) + "' with " +
+                          std::to_string(c->getArgs().size()) + " arguments of type " + toString(c->getDataType()) +
+                          " does not fit its declaration";
+        check.fail(why.c_str());
+    }
     if (!check.ok()) return false;
 
     TextOut::Batch batch(sink);

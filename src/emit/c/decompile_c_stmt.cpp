@@ -40,8 +40,12 @@ void DecompileC::writeGoto(LABEL* target, unsigned int level) {
 void DecompileC::visit(EXP* e) {
     ExprBase* x = e->getExpr();
     // Sound: a value computed for nothing is no warning.
-    if (sound && x && x->getNodeType() != CALL_NODE) pad(indentLevel) << "(void)";
-    if (x) x->accept(this);
+    if (sound && x) {
+        pad(indentLevel) << (discardNeedsNot(x) ? "(void)!" : "(void)");
+        printFlat(x);
+    } else if (x) {
+        x->accept(this);
+    }
     sink << ";\n";
 }
 
