@@ -77,7 +77,7 @@ void Checker::name(NAME* n) {
         case DATA_ARRAY_REF:
         case STRINGLIT_REF:
         case EXTERN_DATA_REF:
-            if (text.empty() && n->getKind() != STRINGLIT_REF)
+            if (text.empty() && n->getKind() != STRINGLIT_REF && !n->isPrivateData())
                 error(n, id + " of kind " + toString(n->getKind()) + " has no symbol");
             break;
         case CONST_ARRAY_REF:

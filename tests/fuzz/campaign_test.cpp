@@ -47,6 +47,19 @@ TEST(Fuzz, DifferentialCampaignAgreesWithGcc) {
     EXPECT_GT(s.callsCompared, 3 * s.seeds);
 }
 
+TEST(Fuzz, SoundProfileCampaignAgreesWithGcc) {
+    // Units with the sound profile's own constructs; each unit's C must also
+    // compile alone with warnings as errors.
+    fuzz::CampaignOptions o = campaign(fuzz::Mode::C, 1, 100);
+    o.profile = Profile::SOUND;
+    o.batch = 50;
+    std::ostringstream log;
+    o.log = &log;
+    fuzz::CampaignStats s = fuzz::runDifferential(o);
+    EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
+    EXPECT_GT(s.callsCompared, 3 * s.seeds);
+}
+
 TEST(Fuzz, AssemblyCampaignAgreesWithTheInterpreter) {
     // The generated assembly subset is assembled, linked with a C driver and run.
     fuzz::CampaignOptions o = campaign(fuzz::Mode::ASM, 1, 100);

@@ -270,9 +270,15 @@ bool DecompileC::writeSoundUnit(ZOA_file& unit, std::ostream& diag) {
     signatures = &sigs;
     sink << "#ifndef ZOA_INT64_TYPES\n#define ZOA_INT64_TYPES\n"
             "typedef long long int64;\ntypedef unsigned long long uint64;\n#endif\n\n";
-    // The tree gives main the parameters it likes.
-    const CallSignature* mainSig = sigs.find("main");
-    if (isGcc && mainSig && mainSig->defined) sink << "#pragma GCC diagnostic ignored \"-Wmain\"\n\n";
+    // GCC's style warnings on valid machine-made expressions (x == x, a
+    // relation used as a number, constant shifts in code that never runs, a
+    // main with the tree's parameters) are no faults of the text.
+    if (isGcc) {
+        for (const char* w : {"tautological-compare", "bool-compare", "int-in-bool-context", "bool-operation",
+                              "shift-count-overflow", "shift-count-negative", "div-by-zero", "overflow", "main"})
+            sink << "#pragma GCC diagnostic ignored \"-W" << w << "\"\n";
+        sink << '\n';
+    }
     // Every function is declared before any data, so tables can hold their addresses.
     for (auto& entry : sigs.all())
         if (!entry.second.defined) declareSignature(entry.first, entry.second);
