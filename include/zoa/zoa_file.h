@@ -84,7 +84,7 @@ enum class Profile { EXACT, SOUND };
 //    function is 0. GCC flavour only: a static subprogram is declared unused,
 //    and pragmas switch off the style warnings that valid machine-made
 //    expressions draw (-Wtautological-compare, -Wbool-compare,
-//    -Wint-in-bool-context, -Wbool-operation, -Wshift-count-overflow and
+//    -Wint-in-bool-context, -Wbool-operation, -Wshift-overflow, -Wshift-count-overflow and
 //    -negative, -Wdiv-by-zero, -Woverflow, -Wmain).
 //  - dumpDot and dumpAscii: identities are numbers in order of appearance
 //    ("@<n>" in the ASCII dump, null "0"); DOT labels escape what Graphviz

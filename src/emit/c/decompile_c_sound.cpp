@@ -275,7 +275,7 @@ bool DecompileC::writeSoundUnit(ZOA_file& unit, std::ostream& diag) {
     // main with the tree's parameters) are no faults of the text.
     if (isGcc) {
         for (const char* w : {"tautological-compare", "bool-compare", "int-in-bool-context", "bool-operation",
-                              "shift-count-overflow", "shift-count-negative", "div-by-zero", "overflow", "main"})
+                              "shift-count-overflow", "shift-count-negative", "shift-overflow", "div-by-zero", "overflow", "main"})
             sink << "#pragma GCC diagnostic ignored \"-W" << w << "\"\n";
         sink << '\n';
     }
