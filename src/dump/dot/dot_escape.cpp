@@ -3,19 +3,19 @@
 
 namespace ZOA {
 
-void appendDotEscaped(TextBuffer& text, const char* s, std::size_t n, bool record) {
+void appendDotEscaped(TextSink& text, const char* s, std::size_t n, bool record) {
     static const char hex[] = "0123456789abcdef";
     for (std::size_t i = 0; i < n; ++i) {
         unsigned char c = static_cast<unsigned char>(s[i]);
         if (c < 0x20 || c >= 0x7f) {
             const char e[] = {'\\', '\\', 'x', hex[c >> 4], hex[c & 15]};
-            text.append(e, sizeof e);
+            text.write(e, sizeof e);
             continue;
         }
         bool special = c == '"' || c == '\\' ||
                        (record && (c == '{' || c == '}' || c == '|' || c == '<' || c == '>'));
-        if (special) text.push_back('\\');
-        text.push_back(static_cast<char>(c));
+        if (special) text << '\\';
+        text << static_cast<char>(c);
     }
 }
 

@@ -2,7 +2,7 @@
 #ifndef ZOA_DUMP_DOT_DOT_ESCAPE_H
 #define ZOA_DUMP_DOT_DOT_ESCAPE_H
 
-#include "dump/text_buffer.h"
+#include "support/text_sink.h"
 
 #include <cstddef>
 
@@ -13,7 +13,7 @@ namespace ZOA {
 // '<' and '>', which would otherwise make fields and ports. Bytes below 0x20,
 // 0x7f and bytes above it (which need not be UTF-8) are shown as "\xNN", the
 // backslash itself escaped.
-void appendDotEscaped(TextBuffer& text, const char* s, std::size_t n, bool record);
+void appendDotEscaped(TextSink& text, const char* s, std::size_t n, bool record);
 
 }  // namespace ZOA
 

@@ -3,7 +3,7 @@
 #define ZOA_EMIT_C_DECOMPILE_C_H
 
 #include "emit/decompile_base.h"
-#include "emit/text_out.h"
+#include "support/text_sink.h"
 #include "emit/used_temps.h"
 
 #include <zoa/enums.h>
@@ -12,6 +12,10 @@
 #include <vector>
 
 namespace ZOA {
+
+class CallSignatures;
+struct CallSignature;
+class ZOA_file;
 
 // Expressions are fully parenthesised; temporaries are "t<id>", labels
 // "LAB<id>", data names "ng<id>" (file level) or "nl<id>" (local). The two
@@ -39,10 +43,10 @@ namespace ZOA {
 //  - A missing child (null expression) prints as nothing; a missing jump
 //    target prints ";" in place of its goto. Nothing ever crashes on a broken
 //    tree.
-class CallSignatures;
-struct CallSignature;
-class ZOA_file;
-
+//  - Nesting deeper than MAX_WALK_DEPTH (a cycle made with the copy
+//    assignments): "/* <CUT_NOTE> */" where the bound is reached; the rest of
+//    that statement of the label is left out and printing goes on after it.
+//
 // The sound profile (sound == true) changes only what the exact texts get
 // wrong (decompile_c_sound.cpp): every array-kind data name is written as
 // "((char *)ng<id>)", so address arithmetic on it counts bytes, as in the
@@ -56,21 +60,8 @@ public:
     DecompileC(std::ostream& os, bool isGcc, bool sound = false);
     ~DecompileC() override;
 
-    void visit(UNOP*) override;
-    void visit(TEMP*) override;
-    void visit(SUBPROG*) override;
-    void visit(SEQ*) override;
-    void visit(NAME*) override;
-    void visit(MOVE*) override;
-    void visit(MEM*) override;
-    void visit(LABEL*) override;
-    void visit(JUMP*) override;
-    void visit(EXP*) override;
-    void visit(CONST*) override;
-    void visit(CJUMP*) override;
-    void visit(CALL*) override;
-    void visit(BUF_TEMP*) override;
-    void visit(BINOP*) override;
+#define ZOA_NODE_KIND(kind, Class) void visit(Class*) override;
+#include "core/node_kinds.def"
 
     void defineName(NAME* n) override;
     void declareNamePrototype(NAME* n) override;
@@ -104,6 +95,7 @@ private:
     void printExpr(ExprBase* e, NodeType t);
     // Prints a statement or label, keeping indentLevel as it was.
     void printStmt(StmtBase* s);
+    void writeCutNote() override;
     void printLabel(LABEL* l);
     // With params (sound profile), each argument that has a parameter is
     // converted to its type.
@@ -129,13 +121,12 @@ private:
     void writeSoundCall(CALL* c);
     void declareSignature(const std::string& name, const CallSignature& sig);
 
-    // Indentation into sink (the base's indent writes to the stream directly).
-    TextOut& pad(unsigned int n) { return sink.indent(n); }
+    TextSink& pad(unsigned int n) { return sink.indent(n); }
 
     bool sound;
     const CallSignatures* signatures = nullptr;  // sound profile, set by writeSoundUnit
     UsedTemps usedTemps;  // reused across subprograms
-    TextOut sink;     // everything this emitter writes goes through it
+    TextSink sink;     // everything this emitter writes goes through it
 };
 
 }  // namespace ZOA

@@ -266,7 +266,7 @@ bool DecompileC::writeSoundUnit(ZOA_file& unit, std::ostream& diag) {
     }
     if (!check.ok()) return false;
 
-    TextOut::Batch batch(sink);
+    TextSink::Batch batch(sink);
     signatures = &sigs;
     sink << "#ifndef ZOA_INT64_TYPES\n#define ZOA_INT64_TYPES\n"
             "typedef long long int64;\ntypedef unsigned long long uint64;\n#endif\n\n";

@@ -23,7 +23,7 @@ NAME* asLabelAddress(ExprBase* e) {
 void DecompileC::printStmt(StmtBase* s) {
     if (!s) return;
     unsigned int saved = indentLevel;
-    s->accept(this);
+    acceptNested(s);
     indentLevel = saved;
 }
 
@@ -44,7 +44,7 @@ void DecompileC::visit(EXP* e) {
         pad(indentLevel) << (discardNeedsNot(x) ? "(void)!" : "(void)");
         printFlat(x);
     } else if (x) {
-        x->accept(this);
+        acceptNested(x);
     }
     sink << ";\n";
 }
@@ -78,7 +78,7 @@ void DecompileC::visit(MOVE* m) {
     }
     if (dst) {
         unsigned int saved = indentLevel;
-        dst->accept(this);
+        acceptNested(dst);
         indentLevel = saved;
     }
     sink << " = ";
@@ -105,7 +105,7 @@ void DecompileC::visit(JUMP* j) {
         // Load the target into the address temporary, then jump through it.
         if (ExprBase* addr = mem->getExpr()) {
             unsigned int saved = indentLevel;
-            addr->accept(this);
+            acceptNested(addr);
             indentLevel = saved;
         }
         sink << " = ";
@@ -190,7 +190,7 @@ void DecompileC::declareTemp(TEMP* t) {
 }
 
 void DecompileC::visit(SUBPROG* sp) {
-    TextOut::Batch batch(sink);
+    TextSink::Batch batch(sink);
     if (sp->isStatic()) sink << "static ";
     if (sp->isExtern()) sink << "extern ";
     writeTypeName(sp->getReturnType());
