@@ -9,7 +9,7 @@ namespace {
 
 const char* const usage =
     "usage: zoa-fuzz [--mode=c|asm|crash] [--seed=N] [--count=N] [--batch=N] [--levels=-O0,-O2]\n"
-    "                [--workdir=DIR] [--shrink=N]\n"
+    "                [--workdir=DIR] [--shrink=N] [--profile=exact|sound]\n"
     "Generates units from seeds N.. and checks them. c and asm: interprets every\n"
     "subprogram, compiles the unit's output with gcc -m32 and compares; failing\n"
     "seeds are written to DIR as text and shrunk. crash: odd trees through every output.\n"
@@ -40,6 +40,13 @@ int main(int argc, char** argv) {
             o.shrinkLimit = static_cast<unsigned>(std::strtoul(value("--shrink=").c_str(), nullptr, 10));
         } else if (!value("--asm-quirks=").empty()) {
             o.asmQuirks = static_cast<unsigned>(std::strtoul(value("--asm-quirks=").c_str(), nullptr, 0));
+        } else if (!value("--profile=").empty()) {
+            std::string p = value("--profile=");
+            if (p != "exact" && p != "sound") {
+                std::cerr << "zoa-fuzz: unknown profile '" << p << "'\n" << usage;
+                return 2;
+            }
+            o.profile = p == "sound" ? ZOA::Profile::SOUND : ZOA::Profile::EXACT;
         } else if (!value("--levels=").empty()) {
             o.optLevels.clear();
             std::string l = value("--levels=");

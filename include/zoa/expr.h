@@ -97,9 +97,15 @@ public:
     void accept(VisitorBase* v) override;
     unsigned int getArraySize() const { return arraySize; }
     void growBufSize(unsigned int n) { arraySize += n; }
+    // The buffer's alignment in bytes; 0 (the default) leaves it to the
+    // output (the C text's char array, the assembly's frame slot). A value
+    // that is not a power of two is rounded up to one; above 4096 it is 4096.
+    void setAlignment(unsigned int bytes);
+    unsigned int getAlignment() const { return alignment; }
 
 private:
     unsigned int arraySize;
+    unsigned int alignment = 0;
 };
 
 // A literal. Integers are kept extended to 64 bits, FLOAT and DOUBLE as a
@@ -178,6 +184,18 @@ public:
     LABEL* getLabelRef() const { return labelRef; }
     const ExprList& getList() const { return exprList; }
     const String& getStringValue() const { return stringValue; }
+    // Data made by createData or createZeroData: never returned by getName,
+    // never merged with other data, written to as the program likes.
+    bool isPrivateData() const { return privateData; }
+    // For a createZeroData name: its size in bytes, all zero at start; 0 for
+    // every other name.
+    unsigned int getZeroBytes() const { return zeroBytes; }
+    // The alignment of a data name's storage in bytes; 0 (the default) is its
+    // values' natural alignment (one byte for zero-filled data). Rounded and
+    // capped as BUF_TEMP::setAlignment. Written for data definitions in both
+    // C flavours and in the assembly; other kinds of names ignore it.
+    void setAlignment(unsigned int bytes);
+    unsigned int getAlignment() const { return alignment; }
 
 protected:
     friend class SUBPROG;
@@ -195,6 +213,9 @@ private:
     unsigned int id;
     NameKind kind;
     bool declaredLocal : 1;
+    bool privateData : 1;
+    unsigned int zeroBytes = 0;
+    unsigned int alignment = 0;
     LABEL* labelRef;
     ExprList exprList;
     String stringValue;

@@ -72,7 +72,16 @@ public:
     NAME* getName(const std::list<ExprBase*>& values);
     NAME* getName(LABEL* l);
 
-    // First match in list order, or null. Integer values match on all 64 bits,
+    // Local data that is never merged (NAME::isPrivateData), with the next
+    // local name id: a DATA_ARRAY_REF holding the values (an empty list gives
+    // a one-byte array), a STATIC_DATA_REF holding c (a null c: an INT_S 0),
+    // or `bytes` zero-filled bytes (a DATA_ARRAY_REF with no values whose
+    // getZeroBytes() is bytes; 0 bytes still get one byte of storage).
+    NAME* createData(const std::list<ExprBase*>& values);
+    NAME* createData(CONST* c);
+    NAME* createZeroData(unsigned int bytes);
+
+    // First match in list order, or null; private data never matches. Integer values match on all 64 bits,
     // FLOAT and DOUBLE on == (so NaN never matches), POINTER elements by node
     // identity; POINTER and VOID constants never match a single constant, and
     // a list element that is not a CONST where a value is needed never matches.

@@ -28,7 +28,9 @@ struct Diagnostic {
 // Warnings: a temporary no subprogram handed out (a free-standing BUF_TEMP);
 // in assembly mode, what the assembly output cannot translate: BINOP operators
 // other than PLUS, MINUS, MUL and the six relations, UNOP operators other than
-// CONV4, and FLOAT or DOUBLE values.
+// CONV4, and FLOAT or DOUBLE values; a subprogram, called function or
+// function/data name text that is not a C identifier or is a C keyword (the
+// sound C output refuses it).
 // A node shared by several parents is checked and reported once, so a tree
 // that contains itself (made through copy assignment) is walked once too. The walk
 // keeps its own stack, so any depth of tree is fine.

@@ -82,6 +82,40 @@ enum class Profile { EXACT, SOUND };
 // the nodes below out. A SEQ that contains itself ends the trace ordering of
 // the label that reached it; every label is still printed. Trees within the
 // bound print whole and exactly as before.
+//
+// In the sound profile (see Profile):
+//  - decompile (C): first refuses, with one "error: sound C: ..." line per
+//    problem on the diagnostic stream and nothing written (the unit keeps its
+//    contents; returns false): a subprogram, called function or function or
+//    data name text that is not a C identifier, is a C keyword or is spelled
+//    like a name the output makes (t<n>, LAB<n>, ng<n>, nl<n>, int64,
+//    uint64); a text naming both a function and data, or data of two kinds;
+//    two subprograms of one name; a call with no name and no pointer; a POINTER
+//    constant holding C text; a call C cannot make as the tree says (another
+//    argument count than a unit or C library function takes, or an external
+//    function called with two return types). Otherwise it writes the guarded
+//    int64/uint64 typedefs, a declaration of every external function
+//    (emit/call_signatures.h: C library functions as their headers declare
+//    them, disagreeing calls give "T f(fixed, ...)"; "static" is dropped),
+//    every subprogram's prototype, name prototypes, then data and
+//    subprograms. Array-kind data names are written "((char *)ng<id>)", so
+//    address arithmetic on them counts bytes (the interpreter agrees); moved
+//    values, fixed call arguments and initializer elements are converted to
+//    their destination's type with a cast; INT64_U constants end in ULL;
+//    FLOAT/DOUBLE constants have 9/17 significant digits, infinities and NaNs
+//    are __builtin_inf()/__builtin_nan("") (GCC) or overflowing constant
+//    expressions (MSVC; a NaN's sign and payload are not kept); string texts
+//    are decoded like C escapes (core/string_text.h) and written back with
+//    octal escapes; a discarded value is cast to void; a value asked of a void
+//    function is 0. GCC flavour only: a static subprogram is declared unused,
+//    and pragmas switch off the style warnings that valid machine-made
+//    expressions draw (-Wtautological-compare, -Wbool-compare,
+//    -Wint-in-bool-context, -Wbool-operation, -Wshift-overflow, -Wshift-count-overflow and
+//    -negative, -Wdiv-by-zero, -Woverflow, -Wmain).
+//  - dumpDot and dumpAscii: identities are numbers in order of appearance
+//    ("@<n>" in the ASCII dump, null "0"); DOT labels escape what Graphviz
+//    reads as record syntax, quotes, backslashes and non-printing bytes, and
+//    a CHAR_U constant shows its decimal value.
 class ZOA_API ZOA_file {
 public:
     ZOA_file(bool isGcc, bool asmMode);
@@ -118,6 +152,12 @@ public:
     NAME* getName(CONST* c);
     NAME* getName(const std::list<ExprBase*>& values);
     NAME* getName(LABEL* l);  // a new LABEL_REF name on every call, not recorded
+
+    // File-level data that is never merged, numbered as getName's names; see
+    // SUBPROG::createData and createZeroData.
+    NAME* createData(const std::list<ExprBase*>& values);
+    NAME* createData(CONST* c);
+    NAME* createZeroData(unsigned int bytes);
 
     // Records a prototype for the called function when no subprogram of the
     // unit has its name (decided now); a later call of the same name replaces

@@ -61,6 +61,19 @@ BUF_TEMP::BUF_TEMP(unsigned int id, unsigned int arraySize) : TEMP(id, POINTER),
 
 void BUF_TEMP::accept(VisitorBase* v) { v->visit(this); }
 
+namespace {
+// Alignment requests: 0 stays 0, others the next power of two up to a page.
+unsigned int alignmentFor(unsigned int bytes) {
+    if (bytes == 0) return 0;
+    unsigned int a = 1;
+    while (a < bytes && a < 4096) a <<= 1;
+    return a;
+}
+}  // namespace
+
+void BUF_TEMP::setAlignment(unsigned int bytes) { alignment = alignmentFor(bytes); }
+void NAME::setAlignment(unsigned int bytes) { alignment = alignmentFor(bytes); }
+
 CONST::CONST(DataType t, long long v) : ExprBase(t) { value.i = v; }
 CONST::CONST(DataType t, double v) : ExprBase(t) { value.f = v; }
 namespace {
@@ -119,18 +132,18 @@ void MEM::replaceExpr(ExprBase* e) {
 }
 
 NAME::NAME(unsigned int id, NameKind k, const char* text)
-    : ExprBase(POINTER), id(id), kind(k), declaredLocal(false), labelRef(nullptr), stringValue(text ? text : "") {}
+    : ExprBase(POINTER), id(id), kind(k), declaredLocal(false), privateData(false), labelRef(nullptr), stringValue(text ? text : "") {}
 
 NAME::NAME(LABEL* l)
-    : ExprBase(POINTER), id(l ? l->getId() : 0), kind(LABEL_REF), declaredLocal(false), labelRef(l) {}
+    : ExprBase(POINTER), id(l ? l->getId() : 0), kind(LABEL_REF), declaredLocal(false), privateData(false), labelRef(l) {}
 
 NAME::NAME(unsigned int id, CONST* c)
-    : ExprBase(c ? c->getDataType() : VOID), id(id), kind(STATIC_DATA_REF), declaredLocal(false), labelRef(nullptr) {
+    : ExprBase(c ? c->getDataType() : VOID), id(id), kind(STATIC_DATA_REF), declaredLocal(false), privateData(false), labelRef(nullptr) {
     exprList.push_back(c);
 }
 
 NAME::NAME(unsigned int id, const std::list<ExprBase*>& values)
-    : ExprBase(POINTER), id(id), kind(CONST_ARRAY_REF), declaredLocal(false), labelRef(nullptr),
+    : ExprBase(POINTER), id(id), kind(CONST_ARRAY_REF), declaredLocal(false), privateData(false), labelRef(nullptr),
       exprList(values.begin(), values.end()) {}
 
 void NAME::accept(VisitorBase* v) { v->visit(this); }

@@ -105,6 +105,29 @@ NAME* SUBPROG::getName(const std::list<ExprBase*>& values) {
 
 NAME* SUBPROG::getName(LABEL* l) { return new NAME(l); }
 
+NAME* SUBPROG::createData(const std::list<ExprBase*>& values) {
+    NAME* n = new NAME(createNameId(), values);
+    n->kind = DATA_ARRAY_REF;
+    n->privateData = true;
+    n->setDeclaredLocal();
+    localNames.push_back(n);
+    return n;
+}
+
+NAME* SUBPROG::createData(CONST* c) {
+    NAME* n = new NAME(createNameId(), c ? c : new CONST(0));
+    n->privateData = true;
+    n->setDeclaredLocal();
+    localNames.push_back(n);
+    return n;
+}
+
+NAME* SUBPROG::createZeroData(unsigned int bytes) {
+    NAME* n = createData(std::list<ExprBase*>{});
+    n->zeroBytes = bytes;
+    return n;
+}
+
 // Matching, shared by the local (arena) and file-level (standard) name lists.
 namespace {
 
@@ -133,6 +156,7 @@ bool sameValue(const ExprBase* a, const ExprBase* b) {
 
 template <class List> NAME* matchText(const char* text, const List& names) {
     for (NAME* n : names) {
+        if (n->isPrivateData()) continue;
         NameKind k = n->getKind();
         if ((k == STRINGLIT_REF || k == SUBPROG_REF || k == STATIC_DATA_REF || k == EXTERN_DATA_REF) &&
             sameText(n, text))
@@ -143,7 +167,7 @@ template <class List> NAME* matchText(const char* text, const List& names) {
 
 template <class List> NAME* matchKindText(NameKind k, const char* text, const List& names) {
     for (NAME* n : names)
-        if (n->getKind() == k && sameText(n, text)) return n;
+        if (n->getKind() == k && !n->isPrivateData() && sameText(n, text)) return n;
     return nullptr;
 }
 
@@ -153,6 +177,7 @@ template <class List> NAME* matchConst(CONST* c, const List& names) {
     if (!isIntegerType(t) && !isFloatingType(t)) return nullptr;
     for (NAME* n : names) {
         const ExprList& l = n->getList();
+        if (n->isPrivateData()) continue;
         if (l.size() == 1 && asConst(l.front()) && n->getDataType() == t && sameValue(l.front(), c)) return n;
     }
     return nullptr;
@@ -161,7 +186,7 @@ template <class List> NAME* matchConst(CONST* c, const List& names) {
 template <class List> NAME* matchValues(const std::list<ExprBase*>& values, const List& names) {
     for (NAME* n : names) {
         const ExprList& l = n->getList();
-        if (l.size() != values.size()) continue;
+        if (n->isPrivateData() || l.size() != values.size()) continue;
         bool same = true;
         auto v = values.begin();
         for (auto e = l.begin(); same && e != l.end(); ++e, ++v) same = sameValue(*e, *v);

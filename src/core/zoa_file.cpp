@@ -82,4 +82,25 @@ NAME* ZOA_file::getName(const std::list<ExprBase*>& values) {
 
 NAME* ZOA_file::getName(LABEL* l) { return new NAME(l); }
 
+NAME* ZOA_file::createData(const std::list<ExprBase*>& values) {
+    NAME* n = new NAME(static_cast<unsigned int>(names.size()), values);
+    n->kind = DATA_ARRAY_REF;
+    n->privateData = true;
+    names.push_back(n);
+    return n;
+}
+
+NAME* ZOA_file::createData(CONST* c) {
+    NAME* n = new NAME(static_cast<unsigned int>(names.size()), c ? c : new CONST(0));
+    n->privateData = true;
+    names.push_back(n);
+    return n;
+}
+
+NAME* ZOA_file::createZeroData(unsigned int bytes) {
+    NAME* n = createData(std::list<ExprBase*>{});
+    n->zeroBytes = bytes;
+    return n;
+}
+
 }  // namespace ZOA

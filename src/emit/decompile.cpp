@@ -11,6 +11,14 @@ namespace ZOA {
 
 bool ZOA_file::decompile(std::ostream& os) {
     if (!checkCurrent()) return false;
+    if (profile == Profile::SOUND && !asmMode) {
+        DecompileC c(os, isGcc, true);
+        if (!c.writeSoundUnit(*this, getDiagnosticStream())) return false;
+        names.clear();
+        subprogs.clear();
+        callPrototypes.clear();
+        return true;
+    }
     std::unique_ptr<DecompileBase> emitter;
     if (asmMode) {
         auto* x86 = new DecompileASM(os, isGcc);

@@ -8,7 +8,7 @@ namespace ZOA::fuzz {
 
 Generated Builder::build() {
     Generated g;
-    g.unit = std::make_unique<ZOA_file>(target.isGcc, target.asmMode);
+    g.unit = std::make_unique<ZOA_file>(target.isGcc, target.asmMode, target.profile);
     unit = g.unit.get();
     makeFileData();
     unsigned n = 1 + below(4);
@@ -64,8 +64,12 @@ long long Builder::argValue(DataType t) {
     return fitTo(t, interesting());
 }
 
+CONST* Builder::floatingConstant(DataType t) {
+    return new CONST(t, static_cast<double>(static_cast<int>(below(17)) - 8) * (chance(30) ? 0.5 : 1.0));
+}
+
 CONST* Builder::constant(DataType t) {
-    if (isFloatingType(t)) return new CONST(t, static_cast<double>(static_cast<int>(below(17)) - 8) * (chance(30) ? 0.5 : 1.0));
+    if (isFloatingType(t)) return floatingConstant(t);
     return new CONST(t, fitTo(t, interesting()));
 }
 
@@ -76,7 +80,7 @@ void Builder::makeFileData() {
         unsigned count = 1u << (1 + below(3));
         std::list<ExprBase*> values;
         for (unsigned k = 0; k < count; ++k) values.push_back(constant(e));
-        NAME* n = unit->getName(values);
+        NAME* n = makeTable(values);
         tables.push_back({n, e, count});
     }
     if (makesStrings()) {
@@ -132,7 +136,7 @@ ExprBase* Builder::address(DataType t, bool forStore) {
     }
     if (o < 0) {
         const Table& tb = tables[-1 - o];
-        return new BINOP(POINTER, PLUS, tb.name, index(tb.count));
+        return new BINOP(POINTER, PLUS, tb.name, tableOffset(index(tb.count), sizeOfType(tb.elem)));
     }
     const Region& r = regions[o];
     unsigned cells = r.size / size;
@@ -192,7 +196,7 @@ void Builder::callOne() {
     CALL* c;
     if (callsThroughPointer()) {
         TEMP* fp = sp->getTemp(POINTER, 0, IN_USE_TEMP);
-        add(new MOVE(fp, unit->getName(SUBPROG_REF, f.name.c_str())));
+        add(new MOVE(fp, functionAddress(f)));
         // The pointer's type comes from the arguments: they must match the parameters.
         for (std::size_t k = 0; k < args.size(); ++k)
             if (args[k]->getDataType() != f.params[k]) args[k] = constant(f.params[k]);

@@ -8,6 +8,7 @@
 #include "core/type_facts.h"
 
 #include <cstdint>
+#include <list>
 #include <random>
 #include <string>
 #include <utility>
@@ -85,6 +86,12 @@ protected:
     virtual bool localTable() { return false; }
     // After every subprogram has its body.
     virtual void finish() {}
+    virtual CONST* floatingConstant(DataType t);
+    // The offset of element idx of a table of elemSize-byte values from its name.
+    virtual ExprBase* tableOffset(ExprBase* idx, unsigned) { return idx; }
+    virtual NAME* makeTable(const std::list<ExprBase*>& values) { return unit->getName(values); }
+    // What a call through a pointer loads the function's address from.
+    virtual ExprBase* functionAddress(const Fn& f) { return unit->getName(SUBPROG_REF, f.name.c_str()); }
 
     // ---- draws
     unsigned below(unsigned n) { return n ? static_cast<unsigned>(rng() % n) : 0; }

@@ -49,6 +49,7 @@ struct Prepared {
     std::string text;
     std::string c;  // the C text, or the assembly text in assembly mode
     bool assembly = false;
+    bool sound = false;
     unsigned fileNames = 0;
     std::vector<Call> calls;
 };
@@ -94,6 +95,7 @@ bool prepareUnit(ZOA_file& unit, const std::vector<Entry>& entries, Prepared& p,
         }
     p.fileNames = static_cast<unsigned>(unit.getNames().size());
     p.assembly = unit.IsAsmMode();
+    p.sound = unit.getProfile() == Profile::SOUND;
     interpret(unit, entries, p, stats);
     std::ostringstream c;
     {
@@ -190,7 +192,9 @@ struct BuildResult {
 BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std::string& dir,
                             const std::string& level) {
     std::string units_c, driver_c, expected;
-    units_c = "typedef long long int64;\ntypedef unsigned long long uint64;\n";
+    bool sound = !units.empty() && units.front()->sound;
+    // The sound text defines the types itself.
+    if (!sound) units_c = "typedef long long int64;\ntypedef unsigned long long uint64;\n";
     driver_c = "#include <stdio.h>\ntypedef long long int64;\ntypedef unsigned long long uint64;\n";
     std::string body;
     std::string units_s;
@@ -232,6 +236,12 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
     // The assembly is position-dependent (OFFSET FLAT:) and assumes nothing of
     // the stack's alignment at a call.
     std::string flags = assembly ? " -no-pie -mstackrealign" : " -fno-strict-aliasing";
+    if (sound && level == "-O0" &&
+        shell("gcc -m32 -c -std=gnu99 -Wall -Werror -Wno-unused-label -Wno-unused-variable "
+              "-Wno-unused-but-set-variable -o " + dir + "/units.o " + unitsFile, &out) != 0) {
+        r.detail = "not clean under -Wall -Werror: " + out.substr(0, 2000);
+        return r;
+    }
     if (shell("gcc -m32 " + level + " -w" + flags + " -o " + prog + " " + unitsFile + " " + dir + "/driver.c", &out) != 0) {
         r.detail = out.substr(0, 2000);
         return r;
@@ -263,9 +273,12 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
 
 // Re-checks one unit given as text, for the shrinker.
 bool textFails(const std::string& text, const std::vector<Entry>& entries, const std::string& prefix,
-               const std::string& dir, const std::vector<std::string>& levels, const std::string& kind) {
+               const std::string& dir, const std::vector<std::string>& levels, const std::string& kind,
+               Profile profile) {
     text::Result parsed = text::parse(text, "reduced.zoa");
     if (!parsed.ok()) return false;
+    // The text form does not keep private data apart: a reduced sound unit may merge it.
+    parsed.unit()->setProfile(profile);
     Prepared p;
     p.prefix = prefix;
     if (!prepareUnit(*parsed.unit(), entries, p, nullptr, nullptr) || p.calls.empty()) return false;
@@ -312,7 +325,7 @@ CampaignStats runDifferential(const CampaignOptions& o) {
                         std::vector<Entry> entries = batchEntries[i];
                         std::string prefix = batch[i].prefix, kind = f.kind;
                         f.reduced = shrink(f.text, [&](const std::string& t) {
-                            return textFails(t, entries, prefix, o.workDir, levels, kind);
+                            return textFails(t, entries, prefix, o.workDir, levels, kind, o.profile);
                         }, 800);
                         writeText(base + ".min.zoa", f.reduced);
                         if (o.log) *o.log << "  reduced: " << base << ".min.zoa\n";
@@ -332,7 +345,8 @@ CampaignStats runDifferential(const CampaignOptions& o) {
         Prepared p;
         p.seed = seed;
         p.prefix = "u" + std::to_string(seed) + "_";
-        Generated g = generate(seed, o.mode, p.prefix, o.asmQuirks);
+        Target target{true, o.mode == Mode::ASM, o.mode == Mode::C ? o.profile : Profile::EXACT};
+        Generated g = generate(seed, o.mode, p.prefix, o.asmQuirks, target);
         p.text = text::write(*g.unit);
         stats.seeds++;
         stats.subprogs += static_cast<unsigned>(g.entries.size());
@@ -358,6 +372,7 @@ void report(std::ostream& os, const CampaignOptions& o, const CampaignStats& s) 
        << s.subprogs << " subprograms, " << s.callsCompared << " calls compared";
     if (o.mode == Mode::ASM) os << " with the assembly output";
     else {
+        if (o.profile == Profile::SOUND) os << " in the sound profile";
         os << " at each of";
         for (const std::string& l : o.optLevels) os << ' ' << l;
     }

@@ -23,6 +23,11 @@ struct CampaignOptions {
     unsigned shrinkLimit = 3;               // failures shrunk per campaign
     std::ostream* log = nullptr;            // progress and failures
     unsigned asmQuirks = 0;                 // AsmQuirk bits the assembly mode may generate
+    // The C mode's profile: in the sound one the units use its constructs,
+    // the interpreter reads them with its meaning, and each unit's C must
+    // also compile on its own at -O0 with -Wall -Werror (but for unused
+    // labels and variables).
+    Profile profile = Profile::EXACT;
 };
 
 struct Failure {

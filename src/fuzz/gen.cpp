@@ -4,6 +4,7 @@
 #include "fuzz/gen_asm.h"
 #include "fuzz/gen_c.h"
 #include "fuzz/gen_odd.h"
+#include "fuzz/gen_sound.h"
 
 namespace ZOA::fuzz {
 
@@ -17,6 +18,7 @@ Generated generate(std::uint64_t seed, Mode mode, const std::string& prefix, uns
         case Mode::ODD: return OddBuilder(seed, prefix, asmQuirks, target).build();
         case Mode::C: break;
     }
+    if (target.profile == Profile::SOUND) return SoundCBuilder(seed, prefix, asmQuirks, target).build();
     return CBuilder(seed, prefix, asmQuirks, target).build();
 }
 

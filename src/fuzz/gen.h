@@ -50,6 +50,11 @@ struct Generated {
 struct Target {
     bool isGcc = true;
     bool asmMode = false;
+    // In the sound profile the C mode also draws what only that profile's C
+    // means: byte offsets on table names, inexact and non-finite floating
+    // constants, tables of function addresses, private mutable data and
+    // alignment requests.
+    Profile profile = Profile::EXACT;
 };
 
 // Builds the unit for `seed`; subprogram names start with `prefix`. The same

@@ -1,6 +1,8 @@
 // The machine: expressions, statements, calls and the public entry points.
 #include "interp/machine.h"
 
+#include "core/string_text.h"
+
 #include "core/op_facts.h"
 #include "core/traces.h"
 #include "core/type_facts.h"
@@ -26,6 +28,15 @@ template <class Key> std::uint32_t Machine::Impl::addressIn(CodeMap<Key>& m, con
 // ---- expressions
 Value Machine::Impl::constant(CONST* k) {
     long long i = k->getIValue();
+    if (sound) {
+        switch (k->getDataType()) {
+            case INT64_U: return Value::of(CType::ULLONG, static_cast<std::uint64_t>(i));
+            case INT_S: return Value::of(CType::INT, static_cast<std::uint64_t>(i));
+            case FLOAT: return Value::floating(FLOAT, static_cast<double>(ctext::narrowToFloat(k->getFValue())));
+            case DOUBLE: return Value::floating(DOUBLE, k->getFValue());
+            default: break;
+        }
+    }
     switch (k->getDataType()) {
         case CHAR_U: return Value::of(CType::UCHAR, static_cast<std::uint64_t>(i));
         case INT_U: return Value::of(CType::UINT, static_cast<std::uint64_t>(i));
@@ -60,6 +71,12 @@ Value Machine::Impl::constant(CONST* k) {
     stop(Status::NO_MEANING, "constant of no type");
 }
 
+std::uint32_t Machine::Impl::stringOf(const NAME* n) {
+    const String& text = n->getStringValue();
+    if (sound) return bytesBlock(decodeStringText(text.data(), text.size()));
+    return stringBlock(text.c_str());
+}
+
 SUBPROG* Machine::Impl::findSubprog(const std::string& name) {
     for (SUBPROG* s : unit.getSubprogs())
         if (s && s->getName() == name.c_str()) return s;
@@ -91,11 +108,12 @@ Value Machine::Impl::nameValue(NAME* n) {
     info.busy = true;
     Value v;
     if (k == STRINGLIT_REF) {
-        v = Value::pointer(stringBlock(n->getStringValue().c_str()));
+        v = Value::pointer(stringOf(n));
     } else if (n->getList().empty()) {
-        v = Value::pointer(allocate(1, false, false));
-        unsigned char zero = 0;
-        store(static_cast<std::uint32_t>(v.bits), &zero, 1);
+        std::uint32_t size = n->getZeroBytes() ? n->getZeroBytes() : 1;
+        v = Value::pointer(allocate(size, false, false));
+        std::vector<unsigned char> zeros(size, 0);
+        store(static_cast<std::uint32_t>(v.bits), zeros.data(), size);
     } else {
         ExprBase* first = n->getList().front();
         if (!first) stop(Status::NO_MEANING, "null array element");
@@ -109,7 +127,7 @@ Value Machine::Impl::nameValue(NAME* n) {
         for (ExprBase* e : n->getList()) {
             Value x;
             if (e && e->getNodeType() == NAME_NODE && static_cast<NAME*>(e)->getKind() == STRINGLIT_REF)
-                x = Value::pointer(stringBlock(static_cast<NAME*>(e)->getStringValue().c_str()));
+                x = Value::pointer(stringOf(static_cast<NAME*>(e)));
             else
                 x = eval(e);
             storeValue(at, et, convert(x, et));
@@ -117,7 +135,7 @@ Value Machine::Impl::nameValue(NAME* n) {
         }
         frame = saved;
         v = Value::pointer(base);
-        v.scale = size;
+        v.scale = sound ? 1 : size;
     }
     info.value = v;
     info.ready = true;

@@ -55,7 +55,13 @@ struct Machine::Impl : Memory, Rules {
     std::unordered_map<const NAME*, NameInfo> names;
     Frame* frame = nullptr;
 
-    Impl(ZOA_file& u, Options o) : Memory(o.strictC), Rules{o.strictC}, unit(u), opt(o) {}
+    // The sound profile's meaning: names count bytes, constants keep their
+    // type and bits, string texts decode as decodeStringText says.
+    bool sound;
+
+    Impl(ZOA_file& u, Options o)
+        : Memory(o.strictC), Rules{o.strictC}, unit(u), opt(o), sound(u.getProfile() == Profile::SOUND) {}
+    std::uint32_t stringOf(const NAME* n);
 
     // Label and function addresses: distinct values outside the data blocks.
     template <class Key> std::uint32_t addressIn(CodeMap<Key>& m, const Key& k);

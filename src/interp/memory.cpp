@@ -97,6 +97,9 @@ bool Memory::literalValue(const std::string& text, std::string& value) {
 std::uint32_t Memory::stringBlock(const std::string& text) {
     std::string s;
     if (!literalValue(text, s)) stop(Status::NO_MEANING, "a string literal the C text cannot close");
+    return bytesBlock(s);
+}
+std::uint32_t Memory::bytesBlock(const std::string& s) {
     std::uint32_t a = allocate(s.size() + 1, false, false);
     store(a, reinterpret_cast<const unsigned char*>(s.c_str()), static_cast<std::uint32_t>(s.size() + 1));
     mem[a].readOnly = true;

@@ -44,6 +44,8 @@ public:
     // A read-only block holding the characters of the literal the C text
     // writes for `text`, NUL-terminated.
     std::uint32_t stringBlock(const std::string& text);
+    // A read-only block holding the bytes and a terminating zero.
+    std::uint32_t bytesBlock(const std::string& bytes);
 
     // The characters of the literal the C text writes for text; false when the
     // literal it writes ends early or its closing quote is escaped.

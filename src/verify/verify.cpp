@@ -3,6 +3,7 @@
 #include <zoa/zoa.h>
 
 #include "core/children.h"
+#include "core/identifiers.h"
 #include "core/op_facts.h"
 #include "support/pointer_table.h"
 
@@ -51,15 +52,25 @@ private:
                               " is not a label of " + quoted(sp->getName()));
     }
     void name(NAME* n);
+    // Function and data names must be C identifiers for the sound C output.
+    void identifier(TreeBase* n, const String& text, const char* what);
     void temp(TEMP* t);
     void walk(TreeBase* root);
     void node(TreeBase* t);
 };
 
+void Checker::identifier(TreeBase* n, const String& text, const char* what) {
+    if (text.empty() || isCIdentifier(text.data(), text.size())) return;
+    const char* why = isPlainIdentifier(text.data(), text.size()) ? " is a C keyword" : " is not a C identifier";
+    report(Severity::WARNING, n, std::string(what) + " " + quoted(text) + why + "; the sound C output refuses it");
+}
+
 void Checker::name(NAME* n) {
     const String& text = n->getStringValue();
     const ExprList& l = n->getList();
     std::string id = (n->isDeclaredLocal() ? "name n" : "name g") + std::to_string(n->getId());
+    if (n->getKind() == SUBPROG_REF || n->getKind() == EXTERN_DATA_REF || n->getKind() == STATIC_DATA_REF)
+        identifier(n, text, id.c_str());
     switch (n->getKind()) {
         case LABEL_REF:
             if (!n->getLabelRef()) error(n, id + " refers to no label");
@@ -68,7 +79,7 @@ void Checker::name(NAME* n) {
         case DATA_ARRAY_REF:
         case STRINGLIT_REF:
         case EXTERN_DATA_REF:
-            if (text.empty() && n->getKind() != STRINGLIT_REF)
+            if (text.empty() && n->getKind() != STRINGLIT_REF && !n->isPrivateData())
                 error(n, id + " of kind " + toString(n->getKind()) + " has no symbol");
             break;
         case CONST_ARRAY_REF:
@@ -124,6 +135,7 @@ void Checker::node(TreeBase* t) {
             CALL* c = static_cast<CALL*>(t);
             if (c->getFunctionName().empty() && !c->getFunctionPointer())
                 error(t, "CALL has neither a function name nor a function pointer");
+            if (!c->getFunctionPointer()) identifier(t, c->getFunctionName(), "called function");
             for (ExprBase* a : c->getArgs()) child(t, a, "argument");
             break;
         }
@@ -192,6 +204,7 @@ void Checker::walk(TreeBase* root) {
 
 void Checker::subprog(SUBPROG& s) {
     sp = &s;
+    identifier(&s, s.getName(), "subprogram");
     ownTemps.clear();
     for (TEMP* t : s.getAllTemps()) ownTemps.insert(t);
     for (NAME* n : s.getAllLocalNames()) walk(n);

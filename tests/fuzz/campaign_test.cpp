@@ -9,6 +9,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <cstdlib>
 #include <sstream>
 #include <string>
 
@@ -44,6 +45,19 @@ TEST(Fuzz, DifferentialCampaignAgreesWithGcc) {
     fuzz::CampaignStats s = fuzz::runDifferential(o);
     EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
     // The campaign must really compare: most calls have a C meaning.
+    EXPECT_GT(s.callsCompared, 3 * s.seeds);
+}
+
+TEST(Fuzz, SoundProfileCampaignAgreesWithGcc) {
+    // Units with the sound profile's own constructs; each unit's C must also
+    // compile alone with warnings as errors.
+    fuzz::CampaignOptions o = campaign(fuzz::Mode::C, 1, 100);
+    o.profile = Profile::SOUND;
+    o.batch = 50;
+    std::ostringstream log;
+    o.log = &log;
+    fuzz::CampaignStats s = fuzz::runDifferential(o);
+    EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
     EXPECT_GT(s.callsCompared, 3 * s.seeds);
 }
 
@@ -113,3 +127,29 @@ TEST(Fuzz, ShrinkKeepsWhatStillFails) {
 }
 
 }  // namespace
+
+// The sound DOT of generated units (C and odd trees) renders with Graphviz,
+// and a second dump of a unit gives the same bytes. ZOA_SOUND_DOT_UNITS sets
+// how many units of each mode (20 by default).
+TEST(Fuzz, SoundDotOfGeneratedUnitsRenders) {
+    const char* env = std::getenv("ZOA_SOUND_DOT_UNITS");
+    unsigned count = env ? static_cast<unsigned>(std::strtoul(env, nullptr, 10)) : 20;
+    std::string all;
+    for (fuzz::Mode mode : {fuzz::Mode::C, fuzz::Mode::ODD}) {
+        for (unsigned seed = 1; seed <= count; ++seed) {
+            fuzz::Target target;
+            target.profile = Profile::SOUND;
+            fuzz::Generated g = fuzz::generate(seed, mode, "u", 0, target);
+            std::ostringstream first, second, stats;
+            g.unit->setDiagnosticStream(&stats);
+            g.unit->dumpDot(first);
+            g.unit->dumpDot(second);
+            ASSERT_EQ(first.str(), second.str()) << "seed " << seed;
+            all += first.str();
+        }
+    }
+    std::string dir = ZOA::testing::scratchDir();
+    std::string path = ZOA::testing::writeFile(dir, "all.dot", all);
+    ZOA::testing::CommandResult r = ZOA::testing::runCommand("dot -Tsvg -o /dev/null '" + path + "'");
+    EXPECT_EQ(r.status, 0) << r.output.substr(0, 2000);
+}

@@ -7,7 +7,9 @@ namespace ZOA {
 
 bool ZOA_file::dumpAscii(std::ostream& os) {
     if (!checkCurrent()) return false;
-    for (SUBPROG* sp : subprogs) DumpTree(sp, os, true);
+    StableIds ids;
+    StableIds* stable = profile == Profile::SOUND ? &ids : nullptr;
+    for (SUBPROG* sp : subprogs) DumpTree(sp, os, true, stable);
     return true;
 }
 

@@ -12,8 +12,8 @@
 
 namespace ZOA {
 
-DumpTree::DumpTree(TreeBase* node, std::ostream& out, bool recursive)
-    : level(0), root(node), out(out), recursive(recursive) {
+DumpTree::DumpTree(TreeBase* node, std::ostream& out, bool recursive, StableIds* ids)
+    : level(0), root(node), out(out), recursive(recursive), ids(ids) {
     if (!root) return;
     path.push_back(root->getNodeType() == LABEL_NODE ? nullptr : root);
     switch (root->getNodeType()) {
@@ -90,27 +90,41 @@ const std::string& DumpTree::annotationClassName(const TreeAnnotation* a) {
 }
 
 void DumpTree::writeNodeHeader(TreeBase* node) {
-    writeIndent() << toString(node->getNodeType()) << '(' << static_cast<const void*>(node) << ')' << std::endl;
+    writeIndent() << toString(node->getNodeType()) << '(';
+    writeId(node);
+    out << ')' << std::endl;
     if (const char* type = dataTypeText(node)) writeIndent() << "DataType: " << type << std::endl;
     writeIndent() << "Annotation: ";
     if (const TreeAnnotation* a = node->getAnnotation()) {
         const std::string& name = annotationClassName(a);
         out.write(name.data(), static_cast<std::streamsize>(name.size()));
-        out << '(' << static_cast<const void*>(a) << ')' << std::endl;
+        out << '(';
+        writeId(a);
+        out << ')' << std::endl;
     } else {
         out << "(0)" << std::endl;
     }
 }
 
 void DumpTree::writeRef(const char* label, const void* node) {
-    writeIndent() << label << node << ')' << std::endl;
+    writeIndent() << label;
+    writeId(node);
+    out << ')' << std::endl;
+}
+
+void DumpTree::writeId(const void* node) {
+    if (!ids) out << node;
+    else if (!node) out << '0';
+    else out << '@' << ids->of(node);
 }
 
 template <class List> void DumpTree::writeList(const char* label, const List& nodes) {
     writeIndent() << label;
     const char* sep = "(";
     for (const auto* node : nodes) {
-        out << sep << static_cast<const void*>(node) << ')';
+        out << sep;
+        writeId(node);
+        out << ')';
         sep = ", (";
     }
     out << std::endl;
@@ -350,7 +364,9 @@ void DumpTree::visit(SUBPROG* n) {
     writeIndent() << "Labels: ";
     const char* sep = "(";
     for (const auto& entry : n->getAllLabels()) {
-        out << sep << static_cast<const void*>(entry.second) << ')';
+        out << sep;
+        writeId(entry.second);
+        out << ')';
         sep = ", (";
     }
     out << std::endl;

@@ -3,6 +3,8 @@
 #define ZOA_DUMP_ASCII_DUMP_TREE_H
 
 #include <zoa/nesting.h>
+#include "dump/stable_ids.h"
+
 #include <zoa/subprog.h>
 #include <zoa/tree_base.h>
 #include <zoa/visitor.h>
@@ -47,7 +49,10 @@ namespace ZOA {
 //  - A root whose kind is one of the base kinds, or unknown, writes nothing.
 class DumpTree : public VisitorBase {
 public:
-    DumpTree(TreeBase* node, std::ostream& out, bool recursive);
+    // With ids (the sound profile), nodes and annotations are identified by
+    // "@" and their number in order of first appearance (shared by the dumps
+    // that get the same ids), a null one by "0", instead of by address.
+    DumpTree(TreeBase* node, std::ostream& out, bool recursive, StableIds* ids = nullptr);
     ~DumpTree() override;
 
 #define ZOA_NODE_KIND(kind, Class) void visit(Class*) override;
@@ -62,6 +67,8 @@ private:
     void writeNodeHeader(TreeBase* node);
     // An identity line: label (ending in "("), the address, ")".
     void writeRef(const char* label, const void* node);
+    // A node's identity: its address, or its stable number.
+    void writeId(const void* node);
     template <class List> void writeList(const char* label, const List& nodes);
     void writeTempFields(TEMP* t);
     void endBlock();
@@ -75,6 +82,7 @@ private:
     TreeBase* root;
     std::ostream& out;
     bool recursive;
+    StableIds* ids;
     NestingGuard nesting;
     // The nodes on the current path, a null entry for each label.
     std::vector<TreeBase*> path;

@@ -1,6 +1,10 @@
 // DumpDot and ZOA_file::dumpDot: Graphviz digraphs of subprograms, node statistics on the diagnostic stream.
 #include "dump/dot/dump_dot.h"
 
+#include "dump/dot/dot_escape.h"
+
+#include <cstring>
+
 #include "core/children.h"
 #include "core/node_kinds.h"
 
@@ -69,15 +73,17 @@ bool formatsPlainDecimal(const std::ostream& os) {
 
 }  // namespace
 
-DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws, std::ostream* stats)
+DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws, std::ostream* stats, bool sound)
     : ownWorkspace(ws ? nullptr : new Workspace(os)),
       workspace(ws ? *ws : *ownWorkspace),
       nodesByKind(workspace.nodesByKind),
       text(workspace.text),
       subprog(sp),
       out(os),
-      plainNumbers(formatsPlainDecimal(os)) {
+      plainNumbers(formatsPlainDecimal(os)),
+      sound(sound) {
     for (int k = 0; k < NODE_TYPE_COUNT; ++k) nodesByKind[k].clear();
+    workspace.ids.clear();
     workspace.declaredOnce.clear();
     if (!subprog) return;
     // Temporaries and labels are most of what is collected once.
@@ -142,7 +148,7 @@ void DumpDot::writeGraphHeader() {
     indent(1);
     lit("graph [fontname=\"Helvetica\", fontsize=20,");
     lit(" label = \"");
-    text << subprog->getName();
+    putText(subprog->getName(), false);
     lit("\"]\n");
 }
 
@@ -201,7 +207,7 @@ void DumpDot::writeFields(TreeBase* n) {
             lit(" | (");
             text << (toString(c->getDataType()));
             lit(" / ");
-            text << c->getFunctionName();
+            putText(c->getFunctionName());
             lit(")");
             break;
         }
@@ -257,7 +263,7 @@ void DumpDot::writeFields(TreeBase* n) {
             lit(" | (");
             text << (toString(sp->getReturnType()));
             lit(" / ");
-            text << sp->getName();
+            putText(sp->getName());
             lit(")");
             break;
         }
@@ -277,7 +283,8 @@ void DumpDot::writeConstValue(CONST* c) {
     switch (c->getDataType()) {
         case CHAR_U:
             // The byte itself, not its number: odd, but what existing DOT files hold.
-            text << static_cast<char>(static_cast<unsigned long long>(c->getIValue()) & 0xffu);
+            if (sound) putUnsigned(static_cast<unsigned long long>(c->getIValue()) & 0xffu);
+            else text << static_cast<char>(static_cast<unsigned long long>(c->getIValue()) & 0xffu);
             break;
         case INT_U:
             putUnsigned(static_cast<unsigned long long>(c->getIValue()) & 0xffffffffu);
@@ -298,7 +305,9 @@ void DumpDot::writeConstValue(CONST* c) {
             break;
         case POINTER: {
             const char* s = static_cast<const char*>(c->getPValue());
-            text << (s ? s : "(char *)0");
+            if (!s) s = "(char *)0";
+            if (sound) appendDotEscaped(text, s, std::strlen(s), true);
+            else text << s;
             break;
         }
         case VOID:
@@ -430,7 +439,16 @@ void DumpDot::putSigned(long long v) {
     text.writeInt(v);
 }
 
+void DumpDot::putText(const String& s, bool record) {
+    if (sound) appendDotEscaped(text, s.data(), s.size(), record);
+    else text << s;
+}
+
 void DumpDot::putIdentity(const TreeBase* n) {
+    if (sound) {
+        putUnsigned(workspace.ids.of(n));
+        return;
+    }
     putUnsigned(static_cast<unsigned long long>(reinterpret_cast<std::uintptr_t>(n)));
 }
 
@@ -443,7 +461,7 @@ template <class F> void DumpDot::putFloating(F v) {
 bool ZOA_file::dumpDot(std::ostream& os) {
     if (!checkCurrent()) return false;
     DumpDot::Workspace workspace(os);
-    for (SUBPROG* sp : subprogs) DumpDot dump(sp, os, &workspace, &getDiagnosticStream());
+    for (SUBPROG* sp : subprogs) DumpDot dump(sp, os, &workspace, &getDiagnosticStream(), profile == Profile::SOUND);
     return true;
 }
 

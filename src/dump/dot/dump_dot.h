@@ -4,6 +4,7 @@
 
 #include "support/pointer_table.h"
 #include "support/text_sink.h"
+#include "dump/stable_ids.h"
 
 #include <zoa/enums.h>
 #include <zoa/memmgr.h>
@@ -55,11 +56,17 @@ public:
         std::vector<TreeBase*> nodesByKind[NODE_TYPE_COUNT];
         PointerSet<const TreeBase*> declaredOnce;
         TextSink text;  // DOT text on its way to the stream
+        StableIds ids;  // sound profile identities
     };
 
     // The node statistics go to `stats`, std::cout when it is null. A given
-    // workspace must have been made for `out`.
-    DumpDot(SUBPROG* subprog, std::ostream& out, Workspace* workspace = nullptr, std::ostream* stats = nullptr);
+    // workspace must have been made for `out`. With sound (the sound
+    // profile) node identities are numbers in order of first appearance in
+    // the digraph, not addresses; names, call names and string constants are
+    // escaped (dot_escape.h) and a CHAR_U constant shows its value in decimal,
+    // so that Graphviz renders every digraph.
+    DumpDot(SUBPROG* subprog, std::ostream& out, Workspace* workspace = nullptr, std::ostream* stats = nullptr,
+            bool sound = false);
     ~DumpDot();
     DumpDot(const DumpDot&) = delete;
     DumpDot& operator=(const DumpDot&) = delete;
@@ -89,6 +96,8 @@ private:
     void putUnsigned(unsigned long long v);
     void putSigned(long long v);
     void putIdentity(const TreeBase* n);
+    // A user text inside a label: escaped in the sound profile.
+    void putText(const String& s, bool record = true);
     template <class F> void putFloating(F v);
 
     std::unique_ptr<Workspace> ownWorkspace;
@@ -99,6 +108,7 @@ private:
     SUBPROG* subprog;
     std::ostream& out;
     bool plainNumbers;  // out formats integers as bare decimal digits
+    bool sound;
 };
 
 }  // namespace ZOA

@@ -11,7 +11,7 @@
 
 namespace ZOA {
 
-DecompileC::DecompileC(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc), sink(os) {}
+DecompileC::DecompileC(std::ostream& os, bool isGcc, bool sound) : DecompileBase(os, isGcc), sound(sound), sink(os) {}
 DecompileC::~DecompileC() {}
 
 void DecompileC::writeCutNote() { sink << "/* " << CUT_NOTE << " */"; }
@@ -92,6 +92,7 @@ void DecompileC::visit(BUF_TEMP* t) {
 
 void DecompileC::visit(CONST* c) {
     pad(indentLevel);
+    if (sound && writeSoundConst(c)) return;
     long long v = c->getIValue();
     std::uint32_t low = static_cast<std::uint32_t>(v);
     char buf[64];
@@ -144,12 +145,18 @@ void DecompileC::visit(NAME* n) {
         writeUnsigned(n->getId());
         return;
     case SUBPROG_REF:
-        sink << "(void *)" << n->getStringValue();
+        sink << (sound ? "((char *)" : "(void *)") << n->getStringValue();
+        if (sound) sink << ')';
         return;
     case CONST_ARRAY_REF:
     case DATA_ARRAY_REF:
     case STRINGLIT_REF:
-        break;
+        // Sound: a char pointer, so arithmetic on it counts bytes.
+        if (!sound) break;
+        sink << "((char *)";
+        writeDataPrefix(n);
+        sink << ')';
+        return;
     case STATIC_DATA_REF:
         // Made from a constant: no text, defined under its generated name.
         if (n->getStringValue().empty()) break;
@@ -205,12 +212,13 @@ void DecompileC::writeArgTypes(CALL* c) {
     }
 }
 
-void DecompileC::writeArgList(CALL* c) {
+void DecompileC::writeArgList(CALL* c, const std::vector<DataType>* params) {
     sink << '(';
-    bool first = true;
+    std::size_t i = 0;
     for (ExprBase* a : c->getArgs()) {
-        if (!first) sink << ", ";
-        first = false;
+        if (i != 0) sink << ", ";
+        if (params && i < params->size()) writeSoundCast((*params)[i], a);
+        ++i;
         printFlat(a);
     }
     sink << ')';
@@ -226,6 +234,9 @@ void DecompileC::visit(CALL* c) {
         sink << "))";
         writeOperand(fp);
         sink << ')';
+    } else if (sound) {
+        writeSoundCall(c);
+        return;
     } else {
         const String& name = c->getFunctionName();
         if (ctext::callCastsToCharPointer(std::string_view(name.data(), name.size()))) sink << "(char *)";

@@ -8,7 +8,14 @@
 
 #include <zoa/enums.h>
 
+#include <string>
+#include <vector>
+
 namespace ZOA {
+
+class CallSignatures;
+struct CallSignature;
+class ZOA_file;
 
 // Expressions are fully parenthesised; temporaries are "t<id>", labels
 // "LAB<id>", data names "ng<id>" (file level) or "nl<id>" (local). The two
@@ -39,9 +46,18 @@ namespace ZOA {
 //  - Nesting deeper than MAX_WALK_DEPTH (a cycle made with the copy
 //    assignments): "/* <CUT_NOTE> */" where the bound is reached; the rest of
 //    that statement of the label is left out and printing goes on after it.
+//
+// The sound profile (sound == true) changes only what the exact texts get
+// wrong (decompile_c_sound.cpp): every array-kind data name is written as
+// "((char *)ng<id>)", so address arithmetic on it counts bytes, as in the
+// tree; constants carry what their type needs (ULL, (-9223372036854775807LL
+// - 1), digits that read back to the same bits, __builtin_inf()/nan in the GCC
+// flavour and overflowing constant expressions in the MSVC one); external
+// calls follow CallSignatures; a SUBPROG_REF in an expression is
+// "((char *)<name>)". The unit layout is writeSoundUnit's.
 class DecompileC : public DecompileBase {
 public:
-    DecompileC(std::ostream& os, bool isGcc);
+    DecompileC(std::ostream& os, bool isGcc, bool sound = false);
     ~DecompileC() override;
 
 #define ZOA_NODE_KIND(kind, Class) void visit(Class*) override;
@@ -65,6 +81,13 @@ public:
     // A C string literal; a quote is escaped unless a backslash precedes it.
     void writeQuotedString(const String& s);
 
+    // Sound profile: refuses a unit whose names cannot be written (a message
+    // per name on diag, returns false, writes nothing); otherwise writes the
+    // whole unit: the int64/uint64 typedefs (guarded), external function
+    // declarations, every subprogram's prototype, name prototypes, data
+    // definitions, then the subprograms.
+    bool writeSoundUnit(ZOA_file& unit, std::ostream& diag);
+
 private:
     // Prints e with indentLevel 0, restoring the level afterwards.
     void printFlat(ExprBase* e);
@@ -74,15 +97,34 @@ private:
     void printStmt(StmtBase* s);
     void writeCutNote() override;
     void printLabel(LABEL* l);
-    void writeArgList(CALL* c);
+    // With params (sound profile), each argument that has a parameter is
+    // converted to its type.
+    void writeArgList(CALL* c, const std::vector<DataType>* params = nullptr);
     void writeArgTypes(CALL* c);
     void writeDataPrefix(NAME* n);
     void writeGoto(LABEL* target, unsigned int level);
     void writeInt(long long v);
     void writeUnsigned(unsigned long long v);
+    // The flavour's alignment request and a blank; nothing for 0.
+    void writeAlignment(unsigned int bytes);
+
+    // Sound profile texts; writeSoundConst is false where the exact text is right.
+    bool writeSoundConst(CONST* c);
+    // "(<type>)" before e where e's C type may differ from `to`.
+    void writeSoundCast(DataType to, ExprBase* e);
+    // A discarded library result needs "(void)!": GCC's malloc and others
+    // warn about "(void)" alone.
+    bool discardNeedsNot(ExprBase* x) const;
+    // "(int)", "(char *)": a cast to the type.
+    void writeCast(DataType to);
+    void writeSoundFloating(double v, bool isFloat);
+    void writeSoundCall(CALL* c);
+    void declareSignature(const std::string& name, const CallSignature& sig);
 
     TextSink& pad(unsigned int n) { return sink.indent(n); }
 
+    bool sound;
+    const CallSignatures* signatures = nullptr;  // sound profile, set by writeSoundUnit
     UsedTemps usedTemps;  // reused across subprograms
     TextSink sink;     // everything this emitter writes goes through it
 };

@@ -1,6 +1,7 @@
 // DecompileC: statements, labels, subprograms, data definitions and prototypes.
 #include "emit/c/decompile_c.h"
 
+#include "core/string_text.h"
 #include "emit/c/c_rules.h"
 
 #include <zoa/expr.h>
@@ -37,7 +38,14 @@ void DecompileC::writeGoto(LABEL* target, unsigned int level) {
 }
 
 void DecompileC::visit(EXP* e) {
-    if (ExprBase* x = e->getExpr()) acceptNested(x);
+    ExprBase* x = e->getExpr();
+    // Sound: a value computed for nothing is no warning.
+    if (sound && x) {
+        pad(indentLevel) << (discardNeedsNot(x) ? "(void)!" : "(void)");
+        printFlat(x);
+    } else if (x) {
+        acceptNested(x);
+    }
     sink << ";\n";
 }
 
@@ -74,7 +82,8 @@ void DecompileC::visit(MOVE* m) {
         indentLevel = saved;
     }
     sink << " = ";
-    if (ctext::moveCastsToCharPointer(src)) sink << "(char *)";
+    if (sound && dst) writeSoundCast(dst->getDataType(), src);
+    else if (ctext::moveCastsToCharPointer(src)) sink << "(char *)";
     printFlat(src);
     sink << ";\n";
 }
@@ -118,9 +127,15 @@ void DecompileC::visit(JUMP* j) {
 
 void DecompileC::visit(CJUMP* c) {
     pad(indentLevel) << "if (";
-    printFlat(c->getLeft());
+    // Sound: a pointer compared with a number compares their bits.
+    ExprBase* l = c->getLeft();
+    ExprBase* r = c->getRight();
+    bool mixed = sound && l && r && (l->getDataType() == POINTER) != (r->getDataType() == POINTER);
+    if (mixed) writeSoundCast(INT_U, l);
+    printFlat(l);
     writeBinopText(c->getRelOp());
-    printFlat(c->getRight());
+    if (mixed) writeSoundCast(INT_U, r);
+    printFlat(r);
     sink << ")\n";
     writeGoto(c->getIfTrue(), indentLevel + 1);
     if (fallsThrough(c)) return;
@@ -148,11 +163,19 @@ void DecompileC::visit(LABEL* l) {
     }
 }
 
+void DecompileC::writeAlignment(unsigned int bytes) {
+    if (bytes == 0) return;
+    sink << (isGcc ? "__attribute__((aligned(" : "__declspec(align(");
+    writeUnsigned(bytes);
+    sink << (isGcc ? "))) " : ")) ");
+}
+
 void DecompileC::declareTemp(TEMP* t) {
     if (!t) return;
     pad(indentLevel);
     if (t->getNodeType() == BUF_TEMP_NODE) {
         unsigned long long size = static_cast<BUF_TEMP*>(t)->getArraySize();
+        writeAlignment(static_cast<BUF_TEMP*>(t)->getAlignment());
         sink << "char t";
         writeUnsigned(t->getId());
         sink << '[';
@@ -208,6 +231,10 @@ void DecompileC::printLabel(LABEL* l) {
 }
 
 void DecompileC::writeQuotedString(const String& s) {
+    if (sound) {
+        sink << quoteCString(decodeStringText(s.data(), s.size()));
+        return;
+    }
     sink << '"';
     const char* p = s.data();
     std::size_t n = s.size();
@@ -231,12 +258,17 @@ void DecompileC::defineName(NAME* n) {
     case DATA_ARRAY_REF: {
         if (values.empty()) {
             // Nothing to size or type it by: a one-byte array keeps references valid.
-            pad(indentLevel) << "static char ";
+            pad(indentLevel) << "static ";
+            writeAlignment(n->getAlignment());
+            sink << "char ";
             writeDataPrefix(n);
-            sink << "[1];\n";
+            sink << '[';
+            writeUnsigned(n->getZeroBytes() ? n->getZeroBytes() : 1);
+            sink << "];\n";
             return;
         }
         pad(indentLevel) << "static ";
+        writeAlignment(n->getAlignment());
         if (firstValue) writeTypeName(firstValue->getDataType());
         writeDataPrefix(n);
         bool labelTable = firstValue && firstValue->getNodeType() == NAME_NODE &&
@@ -270,6 +302,8 @@ void DecompileC::defineName(NAME* n) {
             if (!first) sink << ", ";
             first = false;
             NameKind k = e && e->getNodeType() == NAME_NODE ? static_cast<NAME*>(e)->getKind() : LABEL_REF;
+            if (sound && firstValue && !(e && e->getNodeType() == NAME_NODE && firstValue->getDataType() == POINTER))
+                writeSoundCast(firstValue->getDataType(), e);
             if (k == SUBPROG_REF) sink << "(void *)" << static_cast<NAME*>(e)->getStringValue();
             else if (k == STRINGLIT_REF) writeQuotedString(static_cast<NAME*>(e)->getStringValue());
             else printFlat(e);
@@ -286,6 +320,7 @@ void DecompileC::defineName(NAME* n) {
         return;
     case STATIC_DATA_REF:
         pad(indentLevel) << "static ";
+        writeAlignment(n->getAlignment());
         writeTypeName(n->getDataType());
         if (!firstValue) {
             // Made from a text: defined under the name references print.
@@ -331,7 +366,10 @@ void DecompileC::declareSubprogPrototype(SUBPROG* sp) {
         first = false;
         if (t) writeTypeName(t->getDataType());
     }
-    sink << ");\n";
+    sink << ')';
+    // A static function nothing calls is no error in the sound text.
+    if (sound && isGcc && sp->isStatic()) sink << " __attribute__((unused))";
+    sink << ";\n";
 }
 
 void DecompileC::declareNamePrototype(NAME* n) {

@@ -53,6 +53,10 @@ enum RegClass { LOW_BYTE = 0, HIGH_BYTE = 1, DWORD = 2, QWORD = 3 };
 //    object (size 0, its label only, so references still assemble); a
 //    DATA_ARRAY_REF or STATIC_DATA_REF made from text writes nothing: it names
 //    data defined elsewhere. A null element writes its directive alone.
+//  - Private data (createData, createZeroData) goes to .data: zero-filled data
+//    as ".zero <bytes>" (at least one). A name's alignment request replaces
+//    the ".align" it would get; a BUF_TEMP's is not honoured here (its frame
+//    slot keeps the frame's alignment).
 //  - POINTER constants print "0" when null, else the text they point to (the
 //    client stores e.g. "OFFSET FLAT:sym" there); VOID constants print "0".
 //  - alloca without an argument allocates nothing: only the result (the stack

@@ -246,12 +246,30 @@ void DecompileASM::defineName(NAME* n) {
     switch (n->getKind()) {
     case CONST_ARRAY_REF:
     case DATA_ARRAY_REF: {
-        if (n->getKind() == DATA_ARRAY_REF && values.empty()) return;
+        bool zeroFilled = n->isPrivateData() && values.empty();
+        if (n->getKind() == DATA_ARRAY_REF && values.empty() && !zeroFilled) return;
         DataType t = first ? first->getDataType() : VOID;
         line() << (n->getKind() == CONST_ARRAY_REF ? ".section .rodata" : ".section .data");
         endLine();
-        line() << ".align 4";
+        line() << ".align ";
+        putUnsigned(n->getAlignment() ? n->getAlignment() : 4);
         endLine();
+        if (zeroFilled) {
+            // createZeroData: its bytes, at least one.
+            unsigned int bytes = n->getZeroBytes() ? n->getZeroBytes() : 1;
+            line() << ".type " << sym << ",@object";
+            endLine();
+            line() << ".size " << sym << ',';
+            putUnsigned(bytes);
+            endLine();
+            sink << sym << ':';
+            endLine();
+            line() << ".zero ";
+            putUnsigned(bytes);
+            endLine();
+            endLine();
+            return;
+        }
         line() << ".type " << sym << ",@object";
         endLine();
         line() << ".size " << sym << ',';
@@ -288,10 +306,11 @@ void DecompileASM::defineName(NAME* n) {
     case STATIC_DATA_REF: {
         if (values.empty()) return;
         unsigned int size = sizeOfType(n->getDataType());
-        line() << ".section .rodata";
+        // Private data (createData) may be written.
+        line() << (n->isPrivateData() ? ".section .data" : ".section .rodata");
         endLine();
         line() << ".align ";
-        putUnsigned(size);
+        putUnsigned(n->getAlignment() ? n->getAlignment() : size);
         endLine();
         line() << ".type " << sym << ",@object";
         endLine();
