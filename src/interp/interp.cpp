@@ -2,6 +2,7 @@
 #include <zoa/interp.h>
 #include <zoa/zoa.h>
 
+#include "core/c_literal.h"
 #include "core/traces.h"
 
 #include <cctype>
@@ -226,48 +227,9 @@ struct Machine::Impl {
             if (!b.written[off + i] && opt.strictC) stop(Status::UNDEFINED, "read of memory never written");
         std::memcpy(bytes, b.data.data() + off, n);
     }
-    // The characters of the literal the C text writes for s: a double quote is
-    // escaped unless a backslash precedes it, every other character is written
-    // as it stands, and C then reads the escapes (an unknown one as its letter).
-    static bool literalValue(const std::string& text, std::string& value) {
-        std::string w;
-        for (std::size_t i = 0; i < text.size(); ++i) {
-            if (text[i] == '"' && (i == 0 || text[i - 1] != '\\')) w += '\\';
-            w += text[i];
-        }
-        value.clear();
-        for (std::size_t i = 0; i < w.size(); ++i) {
-            char c = w[i];
-            if (c == '"') return false;  // the literal ends early
-            if (c != '\\') {
-                value += c;
-                continue;
-            }
-            if (++i >= w.size()) return false;  // the closing quote is escaped
-            c = w[i];
-            static const char from[] = "ntrabfv\\'\"?", to[] = "\n\t\r\a\b\f\v\\'\"?";
-            if (const char* p = std::strchr(from, c); p && c) {
-                value += to[p - from];
-            } else if (c >= '0' && c <= '7') {
-                int v = 0;
-                for (int k = 0; k < 3 && i < w.size() && w[i] >= '0' && w[i] <= '7'; ++k, ++i) v = v * 8 + (w[i] - '0');
-                --i;
-                value += static_cast<char>(v);
-            } else if (c == 'x') {
-                int v = 0, k = 0;
-                while (i + 1 < w.size() && std::isxdigit(static_cast<unsigned char>(w[i + 1])))
-                    v = v * 16 + (std::isdigit(static_cast<unsigned char>(w[++i])) ? w[i] - '0' : (w[i] | 0x20) - 'a' + 10), ++k;
-                if (!k) return false;
-                value += static_cast<char>(v);
-            } else {
-                value += c;
-            }
-        }
-        return true;
-    }
     std::uint32_t stringBlock(const std::string& text) {
         std::string s;
-        if (!literalValue(text, s)) stop(Status::NO_MEANING, "a string literal the C text cannot close");
+        if (!cLiteralValue(text.data(), text.size(), s)) stop(Status::NO_MEANING, "a string literal the C text cannot close");
         std::uint32_t a = allocate(s.size() + 1, false, false);
         store(a, reinterpret_cast<const unsigned char*>(s.c_str()), static_cast<std::uint32_t>(s.size() + 1));
         mem[a].readOnly = true;
