@@ -4,6 +4,10 @@
 
 #include <zoa/enums.h>
 
+#include <cfloat>
+#include <cmath>
+#include <cstdint>
+
 namespace ZOA::ctypes {
 
 // The type a value has in the C text: the declared types, plus what the text
@@ -46,6 +50,29 @@ constexpr CT common(CT a, CT b) {
     if (!isSigned(hi)) return hi;
     if (bitsOf(hi) > bitsOf(lo)) return hi;  // the wider signed type holds every value
     return hi == CT::LLONG ? CT::ULLONG : CT::UINT;
+}
+
+// Cuts v to the width of t and extends it back by t's signedness.
+constexpr std::uint64_t fit(CT t, std::uint64_t v) {
+    unsigned w = bitsOf(t);
+    if (w == 64 || w == 0) return v;
+    std::uint64_t mask = (std::uint64_t{1} << w) - 1;
+    v &= mask;
+    if (isSigned(t) && ((v >> (w - 1)) & 1)) v |= ~mask;
+    return v;
+}
+
+// x rounded to t (FLOAT or DOUBLE) as a store to memory rounds it.
+inline double roundTo(CT t, long double x) {
+    if (t != CT::FLOAT) return static_cast<double>(x);
+    if (!(std::fabs(x) <= FLT_MAX)) {
+        // Beyond the float range: round to FLT_MAX or to infinity, as the FPU does.
+        if (std::isnan(x)) return static_cast<double>(x);
+        const long double halfwayToInfinity = 0x1.ffffffp127L;
+        double r = std::fabs(x) < halfwayToInfinity ? FLT_MAX : HUGE_VAL;
+        return std::signbit(x) ? -r : r;
+    }
+    return static_cast<double>(static_cast<float>(x));
 }
 
 }  // namespace ZOA::ctypes

@@ -2,6 +2,9 @@
 #include "fuzz/campaign.h"
 #include "fuzz/quiet_stdout.h"
 
+#include "core/type_facts.h"
+#include "emit/c/c_texts.h"
+
 #include <zoa/interp.h>
 #include <zoa/text.h>
 #include <zoa/verify.h>
@@ -12,6 +15,7 @@
 #include <functional>
 #include <ostream>
 #include <sstream>
+#include <string_view>
 #include <sys/stat.h>
 #include <sys/wait.h>
 
@@ -19,14 +23,15 @@ namespace ZOA::fuzz {
 
 namespace {
 
-const char* cTypeName(DataType t) {
-    static const char* const n[] = {"unsigned char", "unsigned int", "uint64", "char", "int",
-                                    "int64", "float", "double", "char *", "void"};
-    return static_cast<unsigned>(t) < 10 ? n[t] : "void";
+// The C emitter's name of t, without its separating blank.
+std::string cTypeName(DataType t) {
+    std::string_view n = ctext::typeName(t);
+    while (!n.empty() && n.back() == ' ') n.remove_suffix(1);
+    return n.empty() ? "void" : std::string(n);
 }
 const char* printfFormat(DataType t) {
-    static const char* const f[] = {"%d", "%u", "%llu", "%d", "%d", "%lld", "%.9g", "%.17g", "ptr", "void"};
-    return static_cast<unsigned>(t) < 10 ? f[t] : "void";
+    static const char* const f[DATA_TYPE_COUNT] = {"%d", "%u", "%llu", "%d", "%d", "%lld", "%.9g", "%.17g", "ptr", "void"};
+    return static_cast<unsigned>(t) < DATA_TYPE_COUNT ? f[t] : "void";
 }
 
 struct Call {
@@ -49,7 +54,7 @@ struct Prepared {
 };
 
 interp::Value argValue(DataType t, long long v) {
-    return t == FLOAT || t == DOUBLE ? interp::Value::floating(t, static_cast<double>(v)) : interp::Value::integer(t, v);
+    return isFloatingType(t) ? interp::Value::floating(t, static_cast<double>(v)) : interp::Value::integer(t, v);
 }
 
 // Interprets every entry; calls that stop are left out, and the machine is
@@ -101,8 +106,8 @@ bool prepareUnit(ZOA_file& unit, const std::vector<Entry>& entries, Prepared& p,
 
 std::string argText(DataType t, long long v) {
     char buf[64];
-    if (t == FLOAT || t == DOUBLE) std::snprintf(buf, sizeof buf, "(%s)%lld", cTypeName(t), v);
-    else std::snprintf(buf, sizeof buf, "(%s)0x%llxULL", cTypeName(t), static_cast<unsigned long long>(v));
+    if (isFloatingType(t)) std::snprintf(buf, sizeof buf, "(%s)%lld", cTypeName(t).c_str(), v);
+    else std::snprintf(buf, sizeof buf, "(%s)0x%llxULL", cTypeName(t).c_str(), static_cast<unsigned long long>(v));
     return buf;
 }
 
@@ -198,8 +203,8 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
         for (unsigned k = 0; k < p->fileNames; ++k) units_c += "#undef ng" + std::to_string(k) + "\n";
         std::string declared;
         for (const Call& c : p->calls) {
-            std::string proto = std::string(cTypeName(c.result)) + " " + c.name + "(";
-            for (std::size_t i = 0; i < c.params.size(); ++i) proto += (i ? ", " : "") + std::string(cTypeName(c.params[i]));
+            std::string proto = cTypeName(c.result) + " " + c.name + "(";
+            for (std::size_t i = 0; i < c.params.size(); ++i) proto += (i ? ", " : "") + cTypeName(c.params[i]);
             proto += ");\n";
             if (declared.find(proto) == std::string::npos) declared += proto;
             std::string call = c.name + "(";
@@ -210,7 +215,7 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
                 body += "    " + call + "; puts(\"" + label + "void\");\n";
             else
                 body += "    printf(\"" + label + printfFormat(c.result) + "\\n\", " +
-                        (c.result == CHAR_S || c.result == CHAR_U ? "(int)" : c.result == FLOAT ? "(double)" : "") +
+                        (isByteType(c.result) ? "(int)" : c.result == FLOAT ? "(double)" : "") +
                         call + ");\n";
             expected += c.line + "\n";
         }

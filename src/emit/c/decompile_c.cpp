@@ -1,36 +1,15 @@
 // DecompileC: construction, the shared writers and the text of every expression.
 #include "emit/c/decompile_c.h"
 
+#include "emit/c/c_rules.h"
 #include "emit/c/c_texts.h"
 
 #include <zoa/expr.h>
 
-#include <cfloat>
-#include <cmath>
 #include <cstdint>
 #include <cstdio>
-#include <cstring>
 
 namespace ZOA {
-
-namespace {
-
-bool sameText(const String& s, const char* text) {
-    std::size_t n = std::strlen(text);
-    return s.size() == n && std::memcmp(s.data(), text, n) == 0;
-}
-
-// The float the stream would see: values beyond the float range round to
-// FLT_MAX or to infinity as the hardware does, without undefined behaviour.
-float narrowToFloat(double v) {
-    double a = std::fabs(v);
-    if (!(a > FLT_MAX)) return static_cast<float>(v);
-    const double halfwayToInfinity = 0x1.ffffffp127;
-    float r = a < halfwayToInfinity ? FLT_MAX : HUGE_VALF;
-    return std::signbit(v) ? -r : r;
-}
-
-}  // namespace
 
 DecompileC::DecompileC(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc), sink(os) {}
 DecompileC::~DecompileC() {}
@@ -131,8 +110,7 @@ void DecompileC::visit(CONST* c) {
         sink << "LL";
         return;
     case FLOAT:
-        // What an ostream with default flags writes for the float.
-        n = std::snprintf(buf, sizeof buf, "%.*g", 6, static_cast<double>(narrowToFloat(c->getFValue())));
+        n = ctext::formatFloatLiteral(buf, c->getFValue());
         sink.write(buf, static_cast<std::size_t>(n));
         return;
     case DOUBLE:
@@ -239,8 +217,7 @@ void DecompileC::visit(CALL* c) {
         sink << ')';
     } else {
         const String& name = c->getFunctionName();
-        // These two return untyped memory; the cast keeps the C well typed.
-        if (sameText(name, "alloca") || sameText(name, "malloc")) sink << "(char *)";
+        if (ctext::callCastsToCharPointer(std::string_view(name.data(), name.size()))) sink << "(char *)";
         sink << name;
     }
     writeArgList(c);

@@ -1,6 +1,8 @@
 // DecompileC: statements, labels, subprograms, data definitions and prototypes.
 #include "emit/c/decompile_c.h"
 
+#include "emit/c/c_rules.h"
+
 #include <zoa/expr.h>
 #include <zoa/stmt.h>
 #include <zoa/subprog.h>
@@ -8,21 +10,6 @@
 namespace ZOA {
 
 namespace {
-
-bool isArrayName(ExprBase* e) {
-    if (!e || e->getNodeType() != NAME_NODE) return false;
-    NameKind k = static_cast<NAME*>(e)->getKind();
-    return k == CONST_ARRAY_REF || k == DATA_ARRAY_REF || k == STRINGLIT_REF;
-}
-
-// Array and string names are arrays or const pointers in C: a move of one,
-// or of one level of arithmetic on one, gets a (char *) cast.
-bool needsCharPointerCast(ExprBase* src) {
-    if (isArrayName(src)) return true;
-    if (!src || src->getNodeType() != BINOP_NODE) return false;
-    BINOP* b = static_cast<BINOP*>(src);
-    return isArrayName(b->getLeft()) || isArrayName(b->getRight());
-}
 
 NAME* asLabelAddress(ExprBase* e) {
     if (!e || e->getNodeType() != NAME_NODE) return nullptr;
@@ -87,7 +74,7 @@ void DecompileC::visit(MOVE* m) {
         indentLevel = saved;
     }
     sink << " = ";
-    if (needsCharPointerCast(src)) sink << "(char *)";
+    if (ctext::moveCastsToCharPointer(src)) sink << "(char *)";
     printFlat(src);
     sink << ";\n";
 }
@@ -226,7 +213,7 @@ void DecompileC::writeQuotedString(const String& s) {
     std::size_t n = s.size();
     std::size_t runStart = 0;
     for (std::size_t i = 0; i < n; ++i) {
-        if (p[i] != '"' || (i > 0 && p[i - 1] == '\\')) continue;
+        if (!ctext::quoteNeedsEscape(std::string_view(p, n), i)) continue;
         sink.write(p + runStart, i - runStart);
         sink << "\\\"";
         runStart = i + 1;

@@ -3,6 +3,7 @@
 
 #include "core/c_literal.h"
 #include "core/type_facts.h"
+#include "emit/c/c_rules.h"
 
 #include <cfloat>
 #include <cmath>
@@ -15,22 +16,6 @@ namespace ZOA {
 using ctypes::CT;
 
 namespace {
-
-// Cuts v to the width of t and extends it back by t's signedness.
-std::uint64_t fit(CT t, std::uint64_t v) {
-    unsigned w = ctypes::bitsOf(t);
-    if (w == 64 || w == 0) return v;
-    std::uint64_t mask = (std::uint64_t{1} << w) - 1;
-    v &= mask;
-    if (ctypes::isSigned(t) && ((v >> (w - 1)) & 1)) v |= ~mask;
-    return v;
-}
-
-double roundTo(CT t, long double x) {
-    if (t != CT::FLOAT) return static_cast<double>(x);
-    if (!(std::fabs(x) <= FLT_MAX)) return static_cast<double>(x);  // inf and NaN stay as they are
-    return static_cast<double>(static_cast<float>(x));
-}
 
 unsigned alignmentOf(DataType t) {
     unsigned s = sizeOfType(t);
@@ -56,13 +41,13 @@ SoundX86::CVal SoundX86::constValue(CONST* k) {
         // Written with six significant digits: an int literal when it shows no
         // point, else a double literal.
         double d = k->getFValue();
-        if (!(std::fabs(d) <= FLT_MAX)) {
+        if (!std::isfinite(ctext::narrowToFloat(d))) {  // no C text: kept as it is
             v.t = CT::DOUBLE;
             v.real = d;
             return v;
         }
         char buf[64];
-        std::snprintf(buf, sizeof buf, "%g", static_cast<double>(static_cast<float>(d)));
+        ctext::formatFloatLiteral(buf, d);
         if (!std::strpbrk(buf, ".e")) {
             v.t = CT::INT;
             v.bits = static_cast<std::uint64_t>(std::strtoll(buf, nullptr, 10));
@@ -81,7 +66,7 @@ SoundX86::CVal SoundX86::constValue(CONST* k) {
         return v;
     default: return v;
     }
-    v.bits = fit(v.t, static_cast<std::uint64_t>(i));
+    v.bits = ctypes::fit(v.t, static_cast<std::uint64_t>(i));
     return v;
 }
 
@@ -93,7 +78,7 @@ SoundX86::CVal SoundX86::convertValue(const CVal& v, CT to) {
         long double x = ctypes::isReal(v.t)      ? static_cast<long double>(v.real)
                         : ctypes::isSigned(v.t) ? static_cast<long double>(static_cast<long long>(v.bits))
                                                 : static_cast<long double>(v.bits);
-        r.real = roundTo(to, x);
+        r.real = ctypes::roundTo(to, x);
         return r;
     }
     if (ctypes::isReal(v.t)) {
@@ -101,10 +86,10 @@ SoundX86::CVal SoundX86::convertValue(const CVal& v, CT to) {
         double x = std::trunc(v.real);
         if (std::isnan(x) || x <= -9223372036854775808.0 || x >= 18446744073709551616.0) r.bits = 0;
         else r.bits = x < 0 ? static_cast<std::uint64_t>(static_cast<long long>(x)) : static_cast<std::uint64_t>(x);
-        r.bits = to == CT::POINTER ? (r.bits & 0xffffffffu) : fit(to, r.bits);
+        r.bits = to == CT::POINTER ? (r.bits & 0xffffffffu) : ctypes::fit(to, r.bits);
         return r;
     }
-    r.bits = to == CT::POINTER ? (v.bits & 0xffffffffu) : fit(to, v.bits);
+    r.bits = to == CT::POINTER ? (v.bits & 0xffffffffu) : ctypes::fit(to, v.bits);
     return r;
 }
 
