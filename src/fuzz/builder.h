@@ -101,6 +101,8 @@ protected:
     TEMP* varOf(DataType t, bool exact);
     ExprBase* leaf(DataType t);
     ExprBase* index(unsigned count);
+    // An index into a name's elements of `size` bytes, as the target steps through names.
+    ExprBase* nameIndex(unsigned count, unsigned size);
     ExprBase* address(DataType t, bool forStore);
     ExprBase* scaled(ExprBase* idx, unsigned size);
     ExprBase* expr(DataType t, unsigned depth);

@@ -1,6 +1,7 @@
 // Runs generated units through the interpreter and through gcc, and compares.
 #include "fuzz/campaign.h"
 #include "fuzz/quiet_stdout.h"
+#include "fuzz/sound_asm.h"
 
 #include "core/type_facts.h"
 #include "emit/c/c_texts.h"
@@ -49,6 +50,7 @@ struct Prepared {
     std::string text;
     std::string c;  // the C text, or the assembly text in assembly mode
     bool assembly = false;
+    bool sound = false;  // the sound back end's assembly: one file per unit
     unsigned fileNames = 0;
     std::vector<Call> calls;
 };
@@ -94,6 +96,7 @@ bool prepareUnit(ZOA_file& unit, const std::vector<Entry>& entries, Prepared& p,
         }
     p.fileNames = static_cast<unsigned>(unit.getNames().size());
     p.assembly = unit.IsAsmMode();
+    p.sound = p.assembly && unit.getProfile() == Profile::SOUND;
     interpret(unit, entries, p, stats);
     std::ostringstream c;
     {
@@ -194,8 +197,10 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
     driver_c = "#include <stdio.h>\ntypedef long long int64;\ntypedef unsigned long long uint64;\n";
     std::string body;
     std::string units_s;
+    std::vector<const std::string*> soundTexts;
     for (const Prepared* p : units) {
-        if (p->assembly) appendAssemblable(units_s, p->c, p->prefix);
+        if (p->sound) soundTexts.push_back(&p->c);
+        else if (p->assembly) appendAssemblable(units_s, p->c, p->prefix);
         // File-level names are ng<id> in every unit: keep each unit's apart.
         for (unsigned k = 0; k < p->fileNames; ++k)
             units_c += "#define ng" + std::to_string(k) + " " + p->prefix + "ng" + std::to_string(k) + "\n";
@@ -223,15 +228,17 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
     }
     driver_c += "int main(void)\n{\n" + body + "    return 0;\n}\n";
     bool assembly = !units.empty() && units.front()->assembly;
+    bool sound = !units.empty() && units.front()->sound;
     std::string unitsFile = dir + (assembly ? "/units.s" : "/units.c");
-    writeText(unitsFile, assembly ? units_s : units_c);
+    if (sound) unitsFile = writeSoundAsmFiles(soundTexts, dir);
+    else writeText(unitsFile, assembly ? units_s : units_c);
     writeText(dir + "/driver.c", driver_c);
     BuildResult r;
     std::string out;
     std::string prog = dir + "/prog" + level;
     // The assembly is position-dependent (OFFSET FLAT:) and assumes nothing of
     // the stack's alignment at a call.
-    std::string flags = assembly ? " -no-pie -mstackrealign" : " -fno-strict-aliasing";
+    std::string flags = sound ? soundAsmLinkFlags() : assembly ? " -no-pie -mstackrealign" : " -fno-strict-aliasing";
     if (shell("gcc -m32 " + level + " -w" + flags + " -o " + prog + " " + unitsFile + " " + dir + "/driver.c", &out) != 0) {
         r.detail = out.substr(0, 2000);
         return r;
@@ -263,9 +270,10 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
 
 // Re-checks one unit given as text, for the shrinker.
 bool textFails(const std::string& text, const std::vector<Entry>& entries, const std::string& prefix,
-               const std::string& dir, const std::vector<std::string>& levels, const std::string& kind) {
-    text::Result parsed = text::parse(text, "reduced.zoa");
+               const std::string& dir, const std::vector<std::string>& levels, const std::string& kind, bool sound) {
+    text::Result parsed = text::parse(text, "reduced.zoa", text::Flavour{true, sound});
     if (!parsed.ok()) return false;
+    if (sound) parsed.unit()->setProfile(Profile::SOUND);
     Prepared p;
     p.prefix = prefix;
     if (!prepareUnit(*parsed.unit(), entries, p, nullptr, nullptr) || p.calls.empty()) return false;
@@ -286,7 +294,7 @@ CampaignStats runDifferential(const CampaignOptions& o) {
     unsigned shrunk = 0;
     // Only the driver is compiled in assembly mode: one level is enough.
     const std::vector<std::string> levels =
-        o.mode == Mode::ASM ? std::vector<std::string>{"-O0"} : o.optLevels;
+        o.mode == Mode::ASM || o.soundAsm ? std::vector<std::string>{"-O0"} : o.optLevels;
 
     auto flush = [&]() {
         if (batch.empty()) return;
@@ -312,7 +320,7 @@ CampaignStats runDifferential(const CampaignOptions& o) {
                         std::vector<Entry> entries = batchEntries[i];
                         std::string prefix = batch[i].prefix, kind = f.kind;
                         f.reduced = shrink(f.text, [&](const std::string& t) {
-                            return textFails(t, entries, prefix, o.workDir, levels, kind);
+                            return textFails(t, entries, prefix, o.workDir, levels, kind, o.soundAsm);
                         }, 800);
                         writeText(base + ".min.zoa", f.reduced);
                         if (o.log) *o.log << "  reduced: " << base << ".min.zoa\n";
@@ -332,7 +340,9 @@ CampaignStats runDifferential(const CampaignOptions& o) {
         Prepared p;
         p.seed = seed;
         p.prefix = "u" + std::to_string(seed) + "_";
-        Generated g = generate(seed, o.mode, p.prefix, o.asmQuirks);
+        Generated g = o.soundAsm ? generate(seed, o.mode, p.prefix, o.asmQuirks, Target{true, true, true})
+                                 : generate(seed, o.mode, p.prefix, o.asmQuirks);
+        if (o.soundAsm) g.unit->setProfile(Profile::SOUND);
         p.text = text::write(*g.unit);
         stats.seeds++;
         stats.subprogs += static_cast<unsigned>(g.entries.size());
@@ -356,7 +366,8 @@ void report(std::ostream& os, const CampaignOptions& o, const CampaignStats& s) 
     for (const auto& [why, n] : s.dropped) dropped += n;
     os << "seeds " << o.firstSeed << ".." << (o.firstSeed + o.seeds - 1) << ": " << s.seeds << " units, "
        << s.subprogs << " subprograms, " << s.callsCompared << " calls compared";
-    if (o.mode == Mode::ASM) os << " with the assembly output";
+    if (o.soundAsm) os << " with the sound assembly";
+    else if (o.mode == Mode::ASM) os << " with the assembly output";
     else {
         os << " at each of";
         for (const std::string& l : o.optLevels) os << ' ' << l;

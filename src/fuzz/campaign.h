@@ -23,6 +23,9 @@ struct CampaignOptions {
     unsigned shrinkLimit = 3;               // failures shrunk per campaign
     std::ostream* log = nullptr;            // progress and failures
     unsigned asmQuirks = 0;                 // AsmQuirk bits the assembly mode may generate
+    // With Mode::C: the units in assembly mode and the sound profile, their
+    // assembly linked with the C driver and compared with the interpreter.
+    bool soundAsm = false;
 };
 
 struct Failure {

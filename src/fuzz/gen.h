@@ -50,6 +50,7 @@ struct Generated {
 struct Target {
     bool isGcc = true;
     bool asmMode = false;
+    bool namesInBytes = false;  // array names step by bytes (the sound profile): indexes are scaled
 };
 
 // Builds the unit for `seed`; subprogram names start with `prefix`. The same

@@ -117,7 +117,8 @@ Value Machine::Impl::nameValue(NAME* n) {
         }
         frame = saved;
         v = Value::pointer(base);
-        v.scale = size;
+        // The sound profile's C reads an array name as a char pointer.
+        v.scale = unit.getProfile() == Profile::SOUND ? 1 : size;
     }
     info.value = v;
     info.ready = true;
