@@ -137,6 +137,36 @@ TEST(Interp, ControlFlowCallsAndLimits) {
     EXPECT_EQ(run(unit, "nothere"), "error: unknown function");
 }
 
+// Trace building keeps its own stack: a long chain of jumps that each pull the
+// next label, and deeply nested sequences, neither exhaust the host's stack.
+TEST(Interp, LongJumpChainsAndDeepSequencesStopCleanly) {
+    ZOA_file unit(true, false);
+    SUBPROG* chain = unit.createSubprog(INT_S, "chain", false);
+    TEMP* n = chain->getReturnTemp();
+    chain->getStartLabel()->addStmt(new MOVE(n, new CONST(0)));
+    LABEL* prev = chain->getStartLabel();
+    const int length = 100000;
+    for (int i = 0; i < length; ++i) {
+        LABEL* next = chain->createNewLabel(REGULAR_LABEL);
+        prev->addStmt(new JUMP(next));
+        next->addStmt(new MOVE(n, new BINOP(INT_S, PLUS, n, new CONST(1))));
+        prev = next;
+    }
+    prev->addStmt(new JUMP(chain->getReturnLabel()));
+
+    SUBPROG* nested = unit.createSubprog(INT_S, "nested", false);
+    StmtBase* s = new MOVE(nested->getReturnTemp(), new CONST(7));
+    for (int i = 0; i < 100000; ++i) s = new SEQ(s, nullptr);
+    nested->getStartLabel()->addStmt(s);
+
+    interp::Options o;
+    o.maxSteps = 10 * length;
+    interp::Result r = interp::run(unit, "chain", {}, o);
+    ASSERT_TRUE(r.ok()) << r.message;
+    EXPECT_EQ(interp::format(r.value), std::to_string(length));
+    EXPECT_EQ(interp::run(unit, "nested", {}, o).status, interp::Status::DEPTH_LIMIT);
+}
+
 }  // namespace
 
 namespace {
