@@ -93,127 +93,6 @@ void SoundX86::loadFrom(CT t, const char* base, long long offset) {
     }
 }
 
-// A floating value rounded to its type through memory, as C stores it.
-void SoundX86::roundReal(CT to) {
-    const char* size = to == CT::FLOAT ? "DWORD" : "QWORD";
-    const char* bytes = to == CT::FLOAT ? "4" : "8";
-    ins() << "sub\tesp, " << bytes << '\n';
-    ins() << "fstp\t" << size << " PTR [esp]\n";
-    ins() << "fld\t" << size << " PTR [esp]\n";
-    ins() << "add\tesp, " << bytes << '\n';
-}
-
-void SoundX86::intToReal(CT from) {
-    if (from == CT::SCHAR || from == CT::INT) {
-        ins() << "push\teax\n";
-        ins() << "fild\tDWORD PTR [esp]\n";
-        ins() << "add\tesp, 4\n";
-        return;
-    }
-    ins() << (ctypes::is64(from) ? "push\tedx\n" : "push\t0\n");
-    ins() << "push\teax\n";
-    ins() << "fild\tQWORD PTR [esp]\n";
-    ins() << "add\tesp, 8\n";
-    if (from != CT::ULLONG) return;
-    // fild read the top bit as a sign: add 2^64 back.
-    std::string done = internalLabel();
-    ins() << "test\tedx, edx\n";
-    ins() << "jns\t" << done << '\n';
-    ins() << "push\t1602224128\n";  // 2^64 as a float
-    ins() << "fadd\tDWORD PTR [esp]\n";
-    ins() << "add\tesp, 4\n";
-    defineInternal(done);
-}
-
-// Truncation toward zero, as C converts: fistp under a rounding mode of chop.
-void SoundX86::realToInt(CT to) {
-    bool huge = to == CT::ULLONG;
-    std::string small;
-    if (huge) {
-        // From 2^63 up, convert x - 2^63 and set the top bit again.
-        small = internalLabel();
-        ins() << "xor\tecx, ecx\n";
-        ins() << "push\t1593835520\n";  // 2^63 as a float
-        ins() << "fcom\tDWORD PTR [esp]\n";
-        ins() << "fnstsw\tax\n";
-        ins() << "sahf\n";
-        ins() << "jb\t" << small << '\n';
-        ins() << "fsub\tDWORD PTR [esp]\n";
-        ins() << "mov\tecx, -2147483648\n";
-        defineInternal(small);
-        ins() << "add\tesp, 4\n";
-    }
-    ins() << "sub\tesp, 12\n";
-    ins() << "fnstcw\tWORD PTR [esp]\n";
-    ins() << "movzx\teax, WORD PTR [esp]\n";
-    ins() << "or\teax, 3072\n";
-    ins() << "mov\tWORD PTR [esp+2], ax\n";
-    ins() << "fldcw\tWORD PTR [esp+2]\n";
-    ins() << "fistp\tQWORD PTR [esp+4]\n";
-    ins() << "fldcw\tWORD PTR [esp]\n";
-    ins() << "mov\teax, DWORD PTR [esp+4]\n";
-    ins() << "mov\tedx, DWORD PTR [esp+8]\n";
-    ins() << "add\tesp, 12\n";
-    if (huge) ins() << "xor\tedx, ecx\n";
-    if (to == CT::SCHAR) ins() << "movsx\teax, al\n";
-    if (to == CT::UCHAR) ins() << "movzx\teax, al\n";
-}
-
-void SoundX86::convert(VT from, CT to) {
-    CT f = from.t;
-    if (to == CT::VOID) {
-        discard(f);
-        return;
-    }
-    if (f == CT::VOID) {  // no value: read as zero
-        if (ctypes::isReal(to)) ins() << "fldz\n";
-        else ins() << "xor\teax, eax\n";
-        if (ctypes::is64(to)) ins() << "xor\tedx, edx\n";
-        return;
-    }
-    if (f == to) return;
-    if (ctypes::isReal(f) && ctypes::isReal(to)) {
-        if (to == CT::FLOAT) roundReal(to);
-        return;
-    }
-    if (ctypes::isReal(to)) {
-        intToReal(f);
-        if (to == CT::FLOAT || ctypes::is64(f)) roundReal(to);
-        return;
-    }
-    if (ctypes::isReal(f)) {
-        realToInt(to);
-        return;
-    }
-    if (ctypes::is64(to)) {
-        if (!ctypes::is64(f)) ins() << (ctypes::isSigned(f) ? "cdq\n" : "xor\tedx, edx\n");
-        return;
-    }
-    if (to == CT::SCHAR) ins() << "movsx\teax, al\n";
-    if (to == CT::UCHAR) ins() << "movzx\teax, al\n";
-}
-
-void SoundX86::truth(CT t) {
-    if (t == CT::VOID) {
-        ins() << "xor\teax, eax\n";
-        return;
-    }
-    if (ctypes::isReal(t)) {
-        ins() << "fldz\n";
-        ins() << "fucompp\n";
-        ins() << "fnstsw\tax\n";
-        ins() << "sahf\n";
-        ins() << "setne\tal\n";
-        ins() << "setp\tcl\n";
-        ins() << "or\tal, cl\n";
-        ins() << "movzx\teax, al\n";
-        return;
-    }
-    if (ctypes::is64(t)) ins() << "or\teax, edx\n";
-    else ins() << "test\teax, eax\n";
-    setFlag("ne");
-}
-
 SoundX86::VT SoundX86::value(ExprBase* e) {
     VT v = gen(e);
     if (v.t != CT::VOID) return v;
@@ -408,9 +287,103 @@ SoundX86::VT SoundX86::genLogical(BinopKind op, ExprBase* l, ExprBase* r) {
     return VT{CT::INT, 1};
 }
 
+// The common type of two operands; a pointer, having no arithmetic here, counts as unsigned int.
+static CT arithmeticType(CT a, CT b) {
+    auto p = [](CT t) { return t == CT::POINTER ? CT::UINT : ctypes::promote(t); };
+    return ctypes::common(p(a), p(b));
+}
+
+// The type of a right operand usable in place, as a frame slot or an
+// immediate: an int or unsigned int temporary or constant; VOID otherwise.
+static CT directType(ExprBase* r) {
+    if (!r) return CT::VOID;
+    if (r->getNodeType() == TEMP_NODE) {
+        CT t = ctypes::ctOf(r->getDataType());
+        return t == CT::INT || t == CT::UINT ? t : CT::VOID;
+    }
+    if (r->getNodeType() == CONST_NODE) {
+        CT t = SoundX86::constValue(static_cast<CONST*>(r)).t;
+        return t == CT::INT || t == CT::UINT ? t : CT::VOID;
+    }
+    return CT::VOID;
+}
+
+void SoundX86::directOperand(ExprBase* r) {
+    if (r->getNodeType() == TEMP_NODE) memOperand("DWORD", "ebp", slotOf(static_cast<TEMP*>(r)));
+    else num(static_cast<std::int32_t>(constValue(static_cast<CONST*>(r)).bits));
+}
+
+// A 32-bit operation whose right operand needs no evaluation: no stack traffic.
+bool SoundX86::genDirect(BinopKind op, VT a, ExprBase* r, VT& result) {
+    CT rt = directType(r);
+    if (rt == CT::VOID) return false;
+    bool constant = r->getNodeType() == CONST_NODE;
+    if (a.t == CT::POINTER) {
+        if (!isRelation(op) && ((op != PLUS && op != MINUS) || a.scale != 1)) return false;
+        ins() << (isRelation(op) ? "cmp" : op == PLUS ? "add" : "sub") << "\teax, ";
+        directOperand(r);
+        end();
+        if (isRelation(op)) {
+            static const char* const cc[] = {"e", "ne", "b", "be", "a", "ae"};
+            setFlag(cc[op - EQ]);
+            result = VT{CT::INT, 1};
+        } else {
+            result = a;
+        }
+        return true;
+    }
+    CT c = arithmeticType(a.t, rt);
+    if (c != CT::INT && c != CT::UINT) return false;
+    bool sign = c == CT::INT;
+    const char* inst = nullptr;
+    switch (op) {
+    case PLUS: inst = "add"; break;
+    case MINUS: inst = "sub"; break;
+    case BITWISE_AND: inst = "and"; break;
+    case BITWISE_OR: inst = "or"; break;
+    case XOR: inst = "xor"; break;
+    case MUL:
+    case DIV:
+    case MOD: break;
+    default:
+        if (!isRelation(op)) return false;
+        inst = "cmp";
+        break;
+    }
+    convert(a, c);
+    if (op == MUL) {
+        ins() << "imul\teax, ";
+        if (constant) sink << "eax, ";
+        directOperand(r);
+        end();
+    } else if (op == DIV || op == MOD) {
+        ins() << "mov\tecx, ";
+        directOperand(r);
+        end();
+        ins() << (sign ? "cdq\n" : "xor\tedx, edx\n");
+        ins() << (sign ? "idiv\tecx\n" : "div\tecx\n");
+        if (op == MOD) ins() << "mov\teax, edx\n";
+    } else {
+        mnemonic(inst);
+        sink << "\teax, ";
+        directOperand(r);
+        end();
+    }
+    result = VT{c, 1};
+    if (isRelation(op)) {
+        static const char* const signedCc[] = {"e", "ne", "l", "le", "g", "ge"};
+        static const char* const unsignedCc[] = {"e", "ne", "b", "be", "a", "ae"};
+        setFlag((sign ? signedCc : unsignedCc)[op - EQ]);
+        result = VT{CT::INT, 1};
+    }
+    return true;
+}
+
 SoundX86::VT SoundX86::genBinop(BinopKind op, ExprBase* l, ExprBase* r) {
     if (op == AND || op == OR) return genLogical(op, l, r);
     VT a = value(l);
+    VT direct;
+    if (op != LSHIFT && op != RSHIFT && genDirect(op, a, r, direct)) return direct;
     pushValue(a.t);
     VT b = value(r);
     bool pa = a.t == CT::POINTER, pb = b.t == CT::POINTER;
@@ -418,12 +391,6 @@ SoundX86::VT SoundX86::genBinop(BinopKind op, ExprBase* l, ExprBase* r) {
     if ((op == PLUS || op == MINUS) && (pa || pb)) return genPointerArith(op, a, b);
     if (op == LSHIFT || op == RSHIFT) return genShift(op, a, b);
     return genArith(op, a, b);
-}
-
-// The common type of two operands; a pointer, having no arithmetic here, counts as unsigned int.
-static CT arithmeticType(CT a, CT b) {
-    auto p = [](CT t) { return t == CT::POINTER ? CT::UINT : ctypes::promote(t); };
-    return ctypes::common(p(a), p(b));
 }
 
 SoundX86::VT SoundX86::genArith(BinopKind op, VT a, VT b) {

@@ -55,6 +55,8 @@ void SoundX86::labelRef(const LABEL* l) {
     sink.writeUnsigned(l->getId());
 }
 
+void SoundX86::mnemonic(const char* m) { ins() << m; }
+
 std::string SoundX86::internalLabel() { return ".Lz" + std::to_string(internalCount++); }
 
 void SoundX86::memOperand(const char* size, const char* base, long long offset) {

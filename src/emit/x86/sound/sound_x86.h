@@ -63,6 +63,7 @@ private:
     TextOut& ins() { return sink << '\t'; }
     void end() { sink << '\n'; }
     void num(long long v) { sink.writeInt(v); }
+    void mnemonic(const char* m);  // a tab and m (out of line: a chosen text of unknown length)
     void labelRef(const LABEL* l);     // .L<subprog>_<id>, or 0 for a label of no subprogram
     std::string internalLabel();       // .Lz<n>, a fresh one
     void defineInternal(const std::string& l) { sink << l << ":\n"; }
@@ -97,6 +98,8 @@ private:
     VT genUnop(UNOP* u);
     VT genBinop(BinopKind op, ExprBase* l, ExprBase* r);
     VT genArith(BinopKind op, VT l, VT r);
+    bool genDirect(BinopKind op, VT l, ExprBase* r, VT& result);
+    void directOperand(ExprBase* r);
     VT genCompare(BinopKind op, VT l, VT r);
     void operate(BinopKind op, CT c);  // left in the value registers, right at [esp]
     VT genPointerArith(BinopKind op, VT l, VT r);
