@@ -3,6 +3,7 @@
 #define ZOA_ALL_VISITOR_H
 
 #include <zoa/export.h>
+#include <zoa/nesting.h>
 #include <zoa/tree_base.h>
 #include <zoa/visitor.h>
 
@@ -17,7 +18,9 @@ namespace ZOA {
 //   MOVE: dst, src; EXP: expr; JUMP: expr for DIRECT_EXPR only; CJUMP: left,
 //   right; BINOP: left, right; UNOP, MEM: expr; CALL: function pointer, then
 //   args; NAME: its value list; TEMP, BUF_TEMP, CONST: nothing.
-// Null children are skipped.
+// Null children are skipped. The walk follows at most MAX_WALK_DEPTH levels
+// below the root: on a graph with a cycle (made with the copy assignments) it
+// stops there, and the rest of the walk is skipped, so it always ends.
 class ZOA_API AllVisitor : public VisitorBase {
 public:
     explicit AllVisitor(TreeBase* root);
@@ -41,6 +44,11 @@ public:
     void reservedHook1(void*) override {}
     void reservedHook2(void*) override {}
     void reservedHook3(void*) override {}
+
+private:
+    void walkChildren(TreeBase* n);
+    void walk(TreeBase* child);
+    NestingGuard nesting;
 };
 
 }  // namespace ZOA

@@ -6,6 +6,7 @@
 #include <zoa/enums.h>
 #include <zoa/expr.h>
 #include <zoa/memmgr.h>
+#include <zoa/nesting.h>
 #include <zoa/stmt.h>
 #include <zoa/subprog.h>
 #include <zoa/tree_base.h>

@@ -54,7 +54,7 @@ enum class Profile { EXACT, SOUND };
 //    label stop at ud2; alloca takes its memory below the operands of the
 //    statement, which move down with the stack.
 //  - dumpDot: one Graphviz digraph per subprogram; node statistics go to the
-//    process's standard output. Operators beyond the classic ones are labelled
+//    diagnostic stream. Operators beyond the classic ones are labelled
 //    with their enumerator names ("BITWISE_AND", "CONV4"), a POINTER constant
 //    holding a null pointer with "(char *)0"; null children get no edge.
 //  - dumpAscii: an indented text dump of every subprogram. Every line ends with
@@ -65,6 +65,18 @@ enum class Profile { EXACT, SOUND };
 //    a call with neither name nor pointer shows "Function Pointer: " and an
 //    empty line. An annotation shows as "class " and the qualified name of its
 //    dynamic C++ class (e.g. "class tools::Note"), from run-time type information.
+//
+// Any pointer graph a client can build is written in finite time and stack,
+// including cycles made with the nodes' copy assignments (`*s = SEQ(s, 0)`,
+// `*b = BINOP(INT_S, PLUS, b, y)`). Every walk follows at most MAX_WALK_DEPTH
+// (zoa/nesting.h) levels of children; where a walk reaches that bound the
+// rest of what it was writing for the statement of a label (for the dumps:
+// the subprogram's label) is left out, and the outputs say so with CUT_NOTE:
+// the C inside "/* */" in place of the expression or statement, the assembly
+// on a "# " line, the ASCII dump on a line of its own. The DOT graph leaves
+// the nodes below out. A SEQ that contains itself ends the trace ordering of
+// the label that reached it; every label is still printed. Trees within the
+// bound print whole and exactly as before.
 class ZOA_API ZOA_file {
 public:
     ZOA_file(bool isGcc, bool asmMode);

@@ -1,76 +1,48 @@
 // AllVisitor: the fixed whole-tree walk that collecting visitors build on.
 #include <zoa/all_visitor.h>
-#include <zoa/expr.h>
-#include <zoa/stmt.h>
-#include <zoa/subprog.h>
+
+#include "core/children.h"
 
 #include <vector>
 
 namespace ZOA {
 
-namespace {
-inline void walk(TreeBase* n, VisitorBase* v) {
-    if (n) n->accept(v);
+AllVisitor::AllVisitor(TreeBase* root) {
+    if (root) root->accept(this);
 }
-}  // namespace
-
-AllVisitor::AllVisitor(TreeBase* root) { walk(root, this); }
 
 AllVisitor::~AllVisitor() {}
+
+void AllVisitor::walk(TreeBase* child) {
+    NestingLevel level(nesting);
+    if (level.entered()) child->accept(this);
+}
+
+void AllVisitor::walkChildren(TreeBase* n) {
+    forEachChild(n, [this](TreeBase* child) { walk(child); });
+}
 
 void AllVisitor::visit(SUBPROG* sp) {
     // A copy, so that labels added or removed during the walk do not disturb it.
     std::vector<LABEL*> labels;
     labels.reserve(sp->getAllLabels().size());
     for (const auto& entry : sp->getAllLabels()) labels.push_back(entry.second);
-    for (LABEL* l : labels) walk(l, this);
-    walk(sp->getReturnTemp(), this);
+    for (LABEL* l : labels)
+        if (l) walk(l);
+    if (TEMP* t = sp->getReturnTemp()) walk(t);
 }
 
-void AllVisitor::visit(LABEL* l) {
-    if (!l->containsStmts()) return;
-    for (StmtBase* s : l->getStmts()) walk(s, this);
-}
-
-void AllVisitor::visit(SEQ* s) {
-    walk(s->getLeft(), this);
-    walk(s->getRight(), this);
-}
-
-void AllVisitor::visit(MOVE* m) {
-    walk(m->getDst(), this);
-    walk(m->getSrc(), this);
-}
-
-void AllVisitor::visit(EXP* e) { walk(e->getExpr(), this); }
-
-void AllVisitor::visit(JUMP* j) {
-    if (j->getKind() == DIRECT_EXPR) walk(j->getExpr(), this);
-}
-
-void AllVisitor::visit(CJUMP* c) {
-    walk(c->getLeft(), this);
-    walk(c->getRight(), this);
-}
-
-void AllVisitor::visit(BINOP* b) {
-    walk(b->getLeft(), this);
-    walk(b->getRight(), this);
-}
-
-void AllVisitor::visit(UNOP* u) { walk(u->getExpr(), this); }
-
-void AllVisitor::visit(MEM* m) { walk(m->getExpr(), this); }
-
-void AllVisitor::visit(CALL* c) {
-    walk(c->getFunctionPointer(), this);
-    for (ExprBase* a : c->getArgs()) walk(a, this);
-}
-
-void AllVisitor::visit(NAME* n) {
-    for (ExprBase* e : n->getList()) walk(e, this);
-}
-
+void AllVisitor::visit(LABEL* n) { walkChildren(n); }
+void AllVisitor::visit(SEQ* n) { walkChildren(n); }
+void AllVisitor::visit(MOVE* n) { walkChildren(n); }
+void AllVisitor::visit(EXP* n) { walkChildren(n); }
+void AllVisitor::visit(JUMP* n) { walkChildren(n); }
+void AllVisitor::visit(CJUMP* n) { walkChildren(n); }
+void AllVisitor::visit(BINOP* n) { walkChildren(n); }
+void AllVisitor::visit(UNOP* n) { walkChildren(n); }
+void AllVisitor::visit(MEM* n) { walkChildren(n); }
+void AllVisitor::visit(CALL* n) { walkChildren(n); }
+void AllVisitor::visit(NAME* n) { walkChildren(n); }
 void AllVisitor::visit(TEMP*) {}
 void AllVisitor::visit(BUF_TEMP*) {}
 void AllVisitor::visit(CONST*) {}

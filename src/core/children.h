@@ -6,6 +6,8 @@
 #include <zoa/stmt.h>
 #include <zoa/subprog.h>
 
+#include <utility>
+
 namespace ZOA {
 
 // Calls f(child) for each non-null child of n, in AllVisitor's order:
@@ -17,11 +19,12 @@ namespace ZOA {
 // A SUBPROG's labels are read from its map as the walk goes: f must not add
 // or remove labels. Walkers that need more than the children (argument
 // temporaries, jump targets) add them themselves.
-template <class F> void forEachChild(TreeBase* n, F&& f) {
+// k is n's node type, for a caller that has asked it already.
+template <class F> void forEachChild(TreeBase* n, NodeType k, F&& f) {
     auto visit = [&f](TreeBase* c) {
         if (c) f(c);
     };
-    switch (n->getNodeType()) {
+    switch (k) {
     case SUBPROG_NODE: {
         SUBPROG* sp = static_cast<SUBPROG*>(n);
         for (const auto& entry : sp->getAllLabels()) visit(entry.second);
@@ -73,6 +76,8 @@ template <class F> void forEachChild(TreeBase* n, F&& f) {
     case STMT_BASE_NODE: return;
     }
 }
+
+template <class F> void forEachChild(TreeBase* n, F&& f) { forEachChild(n, n->getNodeType(), std::forward<F>(f)); }
 
 }  // namespace ZOA
 

@@ -3,13 +3,9 @@
 #include <zoa/stmt.h>
 #include <zoa/visitor.h>
 
-namespace ZOA {
+#include "core/type_facts.h"
 
-namespace {
-bool isByte(DataType t) { return t == CHAR_S || t == CHAR_U; }
-bool isInt32(DataType t) { return t == INT_S || t == INT_U; }
-bool isInt64(DataType t) { return t == INT64_S || t == INT64_U; }
-}  // namespace
+namespace ZOA {
 
 BINOP::BINOP(DataType t, BinopKind op, ExprBase* left, ExprBase* right)
     : ExprBase(t), op(op), left(left), right(right) {
@@ -21,17 +17,17 @@ void BINOP::checkExprs() {
     if (left->getNodeType() == CONST_NODE || right->getNodeType() == CONST_NODE) return;
     DataType lt = left->getDataType(), rt = right->getDataType(), t = getDataType();
     if (lt == rt || lt == POINTER || rt == POINTER) return;
-    if ((isByte(lt) && isByte(rt)) || (isInt32(lt) && isInt32(rt))) return;
-    if (!isInt32(t)) return;
-    if (isInt64(lt) || isInt64(rt)) return;
+    if ((isByteType(lt) && isByteType(rt)) || (isInt32Type(lt) && isInt32Type(rt))) return;
+    if (!isInt32Type(t)) return;
+    if (isInt64Type(lt) || isInt64Type(rt)) return;
     if (t == INT_U) {
         if (lt == CHAR_S || rt == CHAR_S) return;
         if (lt == CHAR_U) left = new UNOP(t, CONV4, left);
         else if (rt == CHAR_U) right = new UNOP(t, CONV4, right);
         return;
     }
-    if (isByte(lt)) left = new UNOP(t, CONV4, left);
-    else if (isByte(rt)) right = new UNOP(t, CONV4, right);
+    if (isByteType(lt)) left = new UNOP(t, CONV4, left);
+    else if (isByteType(rt)) right = new UNOP(t, CONV4, right);
 }
 
 void BINOP::accept(VisitorBase* v) { v->visit(this); }
@@ -70,7 +66,7 @@ CONST::CONST(DataType t, double v) : ExprBase(t) { value.f = v; }
 namespace {
 // A typed integer literal: FLOAT and DOUBLE keep it as a double.
 template <class Int> void setTyped(DataType t, Int v, long long& i, double& f) {
-    if (t == FLOAT || t == DOUBLE) f = static_cast<double>(v);
+    if (isFloatingType(t)) f = static_cast<double>(v);
     else i = static_cast<long long>(v);
 }
 }  // namespace

@@ -2,6 +2,8 @@
 #include <zoa/subprog.h>
 #include <zoa/visitor.h>
 
+#include "core/type_facts.h"
+
 #include <cstring>
 
 namespace ZOA {
@@ -112,9 +114,6 @@ bool sameText(const NAME* n, const char* text) {
     return s.size() == std::strlen(t) && std::memcmp(s.data(), t, s.size()) == 0;
 }
 
-bool isIntegerType(DataType t) { return t >= CHAR_U && t <= INT64_S; }
-bool isFloatType(DataType t) { return t == FLOAT || t == DOUBLE; }
-
 const CONST* asConst(const ExprBase* e) {
     return e && const_cast<ExprBase*>(e)->getNodeType() == CONST_NODE ? static_cast<const CONST*>(e) : nullptr;
 }
@@ -128,7 +127,7 @@ bool sameValue(const ExprBase* a, const ExprBase* b) {
     const CONST* cb = asConst(b);
     if (!ca || !cb) return false;
     if (isIntegerType(t)) return ca->getIValue() == cb->getIValue();
-    if (isFloatType(t)) return ca->getFValue() == cb->getFValue();
+    if (isFloatingType(t)) return ca->getFValue() == cb->getFValue();
     return false;
 }
 
@@ -151,7 +150,7 @@ template <class List> NAME* matchKindText(NameKind k, const char* text, const Li
 template <class List> NAME* matchConst(CONST* c, const List& names) {
     if (!c) return nullptr;
     DataType t = c->getDataType();
-    if (!isIntegerType(t) && !isFloatType(t)) return nullptr;
+    if (!isIntegerType(t) && !isFloatingType(t)) return nullptr;
     for (NAME* n : names) {
         const ExprList& l = n->getList();
         if (l.size() == 1 && asConst(l.front()) && n->getDataType() == t && sameValue(l.front(), c)) return n;

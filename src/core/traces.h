@@ -5,6 +5,7 @@
 #include <zoa/stmt.h>
 #include <zoa/subprog.h>
 
+#include <cstddef>
 #include <vector>
 
 namespace ZOA {
@@ -25,32 +26,49 @@ protected:
     ~TraceListener() = default;
 };
 
+// How many SEQs the trace walk keeps open at once. The walk is iterative, so
+// this only has to stop a SEQ that contains itself (made with the copy
+// assignments); far above anything a tree nests, and a few megabytes of stack
+// vector at most.
+constexpr std::size_t MAX_TRACE_NESTING = std::size_t{1} << 20;
+
 namespace detail {
 
 inline void pushStatements(LABEL* l, std::vector<StmtBase*>& stack) {
     if (!l->containsStmts()) return;
     const StmtList& stmts = l->getStmts();
-    for (auto it = stmts.rbegin(); it != stmts.rend(); ++it) stack.push_back(*it);
+    for (auto it = stmts.rbegin(); it != stmts.rend(); ++it)
+        if (*it) stack.push_back(*it);
 }
 
-// One statement: a SEQ queues its sides; a jump may pull its target, whose
-// statements then run before anything queued earlier.
-inline void traceStatement(StmtBase* s, LABEL*& last, TraceListener& listener, std::vector<StmtBase*>& stack) {
-    if (!s) return;
+// One statement: a SEQ queues its sides above a null entry that marks its end;
+// a jump may pull its target, whose statements then run before anything
+// queued earlier. False when the SEQs nest too deep.
+inline bool traceStatement(StmtBase* s, LABEL*& last, std::size_t& open, TraceListener& listener,
+                           std::vector<StmtBase*>& stack) {
     NodeType k = s->getNodeType();
     if (k == SEQ_NODE) {
+        if (++open > MAX_TRACE_NESTING) return false;
         SEQ* seq = static_cast<SEQ*>(s);
+        stack.push_back(nullptr);
         if (seq->getRight()) stack.push_back(seq->getRight());
         if (seq->getLeft()) stack.push_back(seq->getLeft());
-        return;
+        return true;
     }
     LABEL* candidate = nullptr;
     if (k == JUMP_NODE && static_cast<JUMP*>(s)->getKind() == DIRECT_LABEL) candidate = static_cast<JUMP*>(s)->getTarget();
     else if (k == CJUMP_NODE) candidate = static_cast<CJUMP*>(s)->getIfFalse();
-    if (!candidate || !listener.place(candidate)) return;
+    if (!candidate || !listener.place(candidate)) return true;
     listener.pulled(s, last);
     last = candidate;
+    // The SEQs this jump ended are closed before the target's statements go
+    // on top, so a long chain of pulls leaves nothing open.
+    while (!stack.empty() && !stack.back()) {
+        stack.pop_back();
+        --open;
+    }
     pushStatements(candidate, stack);
+    return true;
 }
 
 }  // namespace detail
@@ -65,8 +83,10 @@ inline void traceStatement(StmtBase* s, LABEL*& last, TraceListener& listener, s
 // before the statements after the jump. A label is placed once; the true label
 // of a CJUMP and the target of a computed jump are never pulled.
 //
-// The walk keeps its own stack (no recursion), so any depth of SEQ nesting or
-// chain of jumps is fine; `stack` is scratch storage a caller may reuse.
+// The walk keeps its own stack (no recursion), so any chain of jumps and any
+// SEQ nesting up to MAX_TRACE_NESTING is fine; `stack` is scratch storage a
+// caller may reuse. A SEQ that contains itself ends the walk of the work list
+// label that reached it; the labels not yet placed keep their turn.
 inline void buildTraces(SUBPROG* sp, TraceListener& listener, std::vector<StmtBase*>& stack) {
     if (!sp) return;
     std::vector<LABEL*> work;
@@ -84,10 +104,18 @@ inline void buildTraces(SUBPROG* sp, TraceListener& listener, std::vector<StmtBa
         if (!l || !listener.place(l)) continue;
         last = l;
         detail::pushStatements(l, stack);
+        std::size_t open = 0;  // SEQs whose end marker is on the stack
         while (!stack.empty()) {
             StmtBase* s = stack.back();
             stack.pop_back();
-            detail::traceStatement(s, last, listener, stack);
+            if (!s) {
+                --open;
+                continue;
+            }
+            if (!detail::traceStatement(s, last, open, listener, stack)) {
+                stack.clear();
+                break;
+            }
         }
     }
 }

@@ -1,4 +1,4 @@
-// DecompileBase: indentation, the per-subprogram driver and trace building.
+// DecompileBase: the per-subprogram driver and trace building.
 #include "emit/decompile_base.h"
 
 #include <zoa/expr.h>
@@ -11,17 +11,6 @@ namespace ZOA {
 DecompileBase::DecompileBase(std::ostream& os, bool isGcc) : isGcc(isGcc), out(os) {}
 
 DecompileBase::~DecompileBase() {}
-
-std::ostream& DecompileBase::indent(unsigned int n) {
-    static const char blanks[] = "                                                                ";
-    constexpr unsigned int perChunk = (sizeof(blanks) - 1) / 4;
-    while (n > perChunk) {
-        out.write(blanks, perChunk * 4);
-        n -= perChunk;
-    }
-    if (n) out.write(blanks, n * 4);
-    return out;
-}
 
 bool DecompileBase::emitSubprogram(SUBPROG* sp) {
     curSubprog = sp;
@@ -45,6 +34,12 @@ bool DecompileBase::place(LABEL* l) {
 void DecompileBase::pulled(StmtBase* jump, LABEL* prev) { jump->setAnnotation(new TraceAnnotation(prev), true); }
 
 void DecompileBase::buildTraces() { ZOA::buildTraces(curSubprog, *this, traceStack); }
+
+void DecompileBase::acceptNested(TreeBase* n) {
+    NestingLevel level(nesting);
+    if (level.entered()) n->accept(this);
+    else if (level.cutHere()) writeCutNote();
+}
 
 bool DecompileBase::fallsThrough(StmtBase* stmt) const {
     TreeAnnotation* a = stmt->getAnnotation();

@@ -4,6 +4,7 @@
 
 #include "core/traces.h"
 
+#include <zoa/nesting.h>
 #include <zoa/subprog.h>
 #include <zoa/tree_base.h>
 #include <zoa/visitor.h>
@@ -39,8 +40,6 @@ public:
     virtual void declareSubprogPrototype(SUBPROG* sp) = 0;
     virtual void declareCallPrototype(CALL* c) = 0;
 
-    // Writes n levels of four blanks and returns the stream.
-    std::ostream& indent(unsigned int n);
     // Prints one subprogram through its visit, then resets the per-subprogram state.
     bool emitSubprogram(SUBPROG* sp);
     // Orders curSubprog's labels into traceOrder so that jumps can fall
@@ -51,7 +50,11 @@ public:
     // label printed right after curLabel, so the jump is left out.
     bool fallsThrough(StmtBase* stmt) const;
 
-    std::ostream& stream() { return out; }
+    // n->accept(this), one level deeper. Where MAX_WALK_DEPTH cuts the walk (a
+    // cycle made with the copy assignments) the output's writeCutNote() comes
+    // instead, and the rest of the statement of the label that holds it is left out.
+    void acceptNested(TreeBase* n);
+    virtual void writeCutNote() = 0;
 
 protected:
     bool isGcc;
@@ -60,6 +63,7 @@ protected:
     SUBPROG* curSubprog = nullptr;
     LABEL* curLabel = nullptr;
     std::ostream& out;
+    NestingGuard nesting;  // bounds the recursion of the visits
 
 private:
     bool place(LABEL* l) override;

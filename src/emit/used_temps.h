@@ -5,6 +5,7 @@
 #include "emit/used_nodes.h"
 
 #include <zoa/expr.h>
+#include <zoa/nesting.h>
 #include <zoa/subprog.h>
 
 #include <vector>
@@ -13,8 +14,9 @@ namespace ZOA {
 
 // Reaches the same nodes as UsedNodes (labels, statements, the return
 // temporary, the argument temporaries), so isUsed(t) is true exactly when
-// UsedNodes would record t as TEMP_NODE. It walks with a switch over the node
-// type (one virtual call per node instead of accept and visit) and marks the
+// UsedNodes would record t as TEMP_NODE (both stop at MAX_WALK_DEPTH levels,
+// so a cycle ends the walk). It walks with forEachChild (one virtual call per
+// node instead of accept and visit) and marks the
 // subprogram's own temporaries in a vector indexed by id; any other temporary
 // that turns up (another subprogram's, or a copy sharing an id) goes to a map.
 // The buffers keep their capacity, so one collector reused across
@@ -43,6 +45,7 @@ private:
     std::vector<unsigned char> used;  // by id
     UsedMap others;
     std::vector<CALL*> callList;
+    NestingGuard nesting;
 };
 
 }  // namespace ZOA

@@ -1,5 +1,4 @@
-// Test support: write generated text to a scratch directory, build it with the
-// host's 32-bit toolchain and run it. Also golden-file comparison.
+// Test support: scratch files, building and running 32-bit programs, golden-file comparison.
 #ifndef ZOA_TESTS_SUPPORT_NATIVE_H
 #define ZOA_TESTS_SUPPORT_NATIVE_H
 
@@ -24,8 +23,10 @@ std::string scratchDir();
 std::string writeFile(const std::string& dir, const std::string& name, const std::string& text);
 
 // Compiles and links the given sources (paths; .c, .s) with `gcc -m32` into
-// dir/prog and runs it. `flags` go to gcc. Fails the current test with the
-// compiler's messages if the build fails; returns the program's result.
+// dir/prog and runs it: directly, or under qemu-i386 when the kernel cannot
+// run 32-bit programs (status 126) and qemu-i386 is installed. `flags` go to
+// gcc. Fails the current test with the compiler's messages if the build
+// fails; returns the build's or the program's result.
 CommandResult buildAndRun32(const std::string& dir, const std::vector<std::string>& sources,
                             const std::string& flags = "");
 
@@ -34,8 +35,8 @@ CommandResult buildAndRun32(const std::string& dir, const std::vector<std::strin
 std::string normaliseAddresses(const std::string& text);
 
 // Compares text with tests/<relative path>. With ZOA_UPDATE_GOLDEN=1 in the
-// environment the file is rewritten instead and the comparison passes.
-// Returns a gtest assertion result for EXPECT_TRUE.
+// environment the file is rewritten instead and the comparison passes. True
+// on a match; otherwise *diff says where the texts part (EXPECT_GOLDEN shows it).
 bool matchesGolden(const std::string& relativePath, const std::string& text, std::string* diff);
 
 }  // namespace ZOA::testing

@@ -15,6 +15,7 @@ namespace ZOA {
 DumpTree::DumpTree(TreeBase* node, std::ostream& out, bool recursive)
     : level(0), root(node), out(out), recursive(recursive) {
     if (!root) return;
+    path.push_back(root->getNodeType() == LABEL_NODE ? nullptr : root);
     switch (root->getNodeType()) {
     case BINOP_NODE: visit(static_cast<BINOP*>(root)); break;
     case BUF_TEMP_NODE: visit(static_cast<BUF_TEMP*>(root)); break;
@@ -125,7 +126,28 @@ void DumpTree::children(std::initializer_list<TreeBase*> nodes) {
 }
 
 void DumpTree::descend(TreeBase* child) {
-    if (child) child->accept(this);
+    if (!child) return;
+    NestingLevel nest(nesting);
+    if (!nest.entered()) {
+        if (nest.cutHere()) {
+            writeIndent() << CUT_NOTE << std::endl;
+            endBlock();
+        }
+        return;
+    }
+    bool isLabel = child->getNodeType() == LABEL_NODE;
+    // Below its own copy since the last label: a cycle of the copy
+    // assignments (cycles through jumps end at labels, see visit(LABEL)).
+    bool again = false;
+    if (!isLabel)
+        for (auto it = path.rbegin(); it != path.rend() && *it; ++it)
+            if (*it == child) again = true;
+    path.push_back(isLabel ? nullptr : child);
+    bool wasRecursive = recursive;
+    if (again) recursive = false;  // its block, nothing beneath
+    child->accept(this);
+    recursive = wasRecursive;
+    path.pop_back();
 }
 
 void DumpTree::visit(UNOP* n) {

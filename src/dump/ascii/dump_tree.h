@@ -2,6 +2,7 @@
 #ifndef ZOA_DUMP_ASCII_DUMP_TREE_H
 #define ZOA_DUMP_ASCII_DUMP_TREE_H
 
+#include <zoa/nesting.h>
 #include <zoa/subprog.h>
 #include <zoa/tree_base.h>
 #include <zoa/visitor.h>
@@ -27,6 +28,12 @@ namespace ZOA {
 //    that stack gets its ordinary block (header, Id, StartStmt, Kind, empty
 //    line) but nothing beneath it. Its StartStmt identity points at the block
 //    already written above, so the dump terminates and stays readable.
+//  - Other cycles, made with the copy assignments (a BINOP that is its own
+//    operand, a SEQ that contains itself): a node met again below itself with
+//    no label in between gets its ordinary block and nothing beneath it.
+//  - Nesting deeper than MAX_WALK_DEPTH: where the bound is reached, a line
+//    with CUT_NOTE and an empty line come in place of the block, and the rest
+//    of the dump below the root's child that holds it is left out.
 //  - Null children (expr, left, right, dst, src, target, list elements): the
 //    identity line shows the null pointer as the stream writes it ("(0)" with
 //    GCC's library) and no block is written for it.
@@ -43,21 +50,8 @@ public:
     DumpTree(TreeBase* node, std::ostream& out, bool recursive);
     ~DumpTree() override;
 
-    void visit(UNOP*) override;
-    void visit(TEMP*) override;
-    void visit(SUBPROG*) override;
-    void visit(SEQ*) override;
-    void visit(NAME*) override;
-    void visit(MOVE*) override;
-    void visit(MEM*) override;
-    void visit(LABEL*) override;
-    void visit(JUMP*) override;
-    void visit(EXP*) override;
-    void visit(CONST*) override;
-    void visit(CJUMP*) override;
-    void visit(CALL*) override;
-    void visit(BUF_TEMP*) override;
-    void visit(BINOP*) override;
+#define ZOA_NODE_KIND(kind, Class) void visit(Class*) override;
+#include "core/node_kinds.def"
     void reservedHook1(void*) override {}
     void reservedHook2(void*) override {}
     void reservedHook3(void*) override {}
@@ -81,6 +75,9 @@ private:
     TreeBase* root;
     std::ostream& out;
     bool recursive;
+    NestingGuard nesting;
+    // The nodes on the current path, a null entry for each label.
+    std::vector<TreeBase*> path;
     // Labels whose first statement is being dumped on the current path.
     std::vector<LABEL*> labelPath;
     // Demangled "class ..." names, one per annotation type met.

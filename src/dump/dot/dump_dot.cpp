@@ -1,13 +1,14 @@
 // DumpDot and ZOA_file::dumpDot: Graphviz digraphs of subprograms, node statistics on the diagnostic stream.
 #include "dump/dot/dump_dot.h"
 
+#include "core/children.h"
+#include "core/node_kinds.h"
+
 #include <zoa/expr.h>
 #include <zoa/stmt.h>
 #include <zoa/subprog.h>
 #include <zoa/zoa_file.h>
 
-#include <charconv>
-#include <cstring>
 #include <iostream>
 #include <locale>
 #include <string_view>
@@ -16,25 +17,37 @@ namespace ZOA {
 
 namespace {
 
-struct KindInfo {
-    std::string_view name;    // record label and statistics name
-    std::string_view colour;  // Graphviz colour name; empty when never drawn
-    bool ownBlock;            // declared in a subgraph of its own
+// Graphviz colour by NodeType; empty for kinds never declared (the bases, and
+// JUMP, which is counted but never drawn). Names come from the list of kinds.
+constexpr std::string_view kindColours[NODE_TYPE_COUNT] = {
+    "",             // TreeBase
+    "",             // ExprBase
+    "pink",         // BINOP
+    "yellow",       // BUF_TEMP
+    "beige",        // CALL
+    "khaki",        // CONST
+    "gold",         // MEM
+    "greenyellow",  // NAME
+    "yellow",       // TEMP
+    "violet",       // UNOP
+    "",             // StmtBase
+    "green",        // CJUMP
+    "palegreen",    // EXP
+    "",             // JUMP
+    "cyan",         // LABEL
+    "indigo",       // MOVE
+    "magenta",      // SEQ
+    "skyblue",      // SUBPROG
 };
 
-// Indexed by NodeType. Temporaries are drawn in yellow inside the SUBPROG
-// block; JUMP nodes are counted but never declared.
-constexpr KindInfo kinds[NODE_TYPE_COUNT] = {
-    {"TreeBase", "", false},        {"ExprBase", "", false},
-    {"BINOP", "pink", true},        {"BUF_TEMP", "yellow", false},
-    {"CALL", "beige", true},        {"CONST", "khaki", true},
-    {"MEM", "gold", true},          {"NAME", "greenyellow", true},
-    {"TEMP", "yellow", false},      {"UNOP", "violet", true},
-    {"StmtBase", "", false},        {"CJUMP", "green", true},
-    {"EXP", "palegreen", true},     {"JUMP", "", false},
-    {"LABEL", "cyan", true},        {"MOVE", "indigo", true},
-    {"SEQ", "magenta", true},       {"SUBPROG", "skyblue", true},
-};
+// Temporaries are drawn in yellow inside the SUBPROG block; the other drawn
+// kinds get a subgraph of their own.
+bool hasOwnBlock(int k) { return !kindColours[k].empty() && k != TEMP_NODE && k != BUF_TEMP_NODE; }
+
+// Leaves and labels are declared once however often the walk meets them.
+bool collectedOnce(NodeType k) {
+    return k == TEMP_NODE || k == BUF_TEMP_NODE || k == CONST_NODE || k == NAME_NODE || k == LABEL_NODE;
+}
 
 // Indexed by DumpDot::EdgeEnding. OPEN leaves the line open on purpose.
 constexpr std::string_view edgeEndings[] = {
@@ -46,33 +59,6 @@ constexpr std::string_view edgeEndings[] = {
     ";",
 };
 
-constexpr std::size_t flushThreshold = 1 << 15;
-
-// Writes v in decimal at p and returns the length. Identities are addresses of
-// up to 15 digits: the low eight digits are done in 32-bit pairs, which is
-// about twice as fast as to_chars on such values.
-std::size_t writeDecimal(char* p, unsigned long long v) {
-    if (v < 100000000ull) {
-        auto small = static_cast<std::uint32_t>(v);
-        return static_cast<std::size_t>(std::to_chars(p, p + 24, small).ptr - p);
-    }
-    std::size_t n = writeDecimal(p, v / 100000000ull);
-    auto low = static_cast<std::uint32_t>(v % 100000000ull);
-    static const char pairs[] =
-        "00010203040506070809101112131415161718192021222324252627282930313233343536373839"
-        "40414243444546474849505152535455565758596061626364656667686970717273747576777879"
-        "8081828384858687888990919293949596979899";
-    char* d = p + n + 8;
-    for (int i = 0; i < 4; ++i) {
-        std::uint32_t two = low % 100;
-        low /= 100;
-        d -= 2;
-        d[0] = pairs[two * 2];
-        d[1] = pairs[two * 2 + 1];
-    }
-    return n + 8;
-}
-
 bool formatsPlainDecimal(const std::ostream& os) {
     std::ios_base::fmtflags f = os.flags();
     std::ios_base::fmtflags base = f & std::ios_base::basefield;
@@ -81,13 +67,10 @@ bool formatsPlainDecimal(const std::ostream& os) {
     return std::use_facet<std::numpunct<char>>(os.getloc()).grouping().empty();
 }
 
-void putView(TextBuffer& text, std::string_view v) { text.append(v.data(), v.size()); }
-
 }  // namespace
 
 DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws, std::ostream* stats)
-    : AllVisitor(sp),
-      ownWorkspace(ws ? nullptr : new Workspace),
+    : ownWorkspace(ws ? nullptr : new Workspace(os)),
       workspace(ws ? *ws : *ownWorkspace),
       nodesByKind(workspace.nodesByKind),
       text(workspace.text),
@@ -96,53 +79,44 @@ DumpDot::DumpDot(SUBPROG* sp, std::ostream& os, Workspace* ws, std::ostream* sta
       plainNumbers(formatsPlainDecimal(os)) {
     for (int k = 0; k < NODE_TYPE_COUNT; ++k) nodesByKind[k].clear();
     workspace.declaredOnce.clear();
-    text.clear();
     if (!subprog) return;
     // Temporaries and labels are most of what is collected once.
     workspace.declaredOnce.reserve(subprog->getAllTemps().size() + subprog->getAllLabels().size());
-    subprog->accept(this);
+    // Each label is a walk of its own, so a cut ends only the label that holds a cycle.
+    forEachChild(subprog, SUBPROG_NODE, [this](TreeBase* child) { collect(child); });
+    record(subprog, SUBPROG_NODE);
     writeStatistics(stats ? *stats : std::cout);
+    TextSink::Batch batch(text);  // the graph reaches `out` before the next statistics
     writeGraphHeader();
     writeKindBlocks();
     writeConnections();
     lit("}\n");
-    flushText();
 }
 
 DumpDot::~DumpDot() {
     for (int k = 0; k < NODE_TYPE_COUNT; ++k) nodesByKind[k].clear();
     workspace.declaredOnce.clear();
-    text.clear();
 }
 
 // ---- collection walk: children first, then the node itself ----
 
-void DumpDot::collect(TreeBase* n) { nodesByKind[n->getNodeType()].push_back(n); }
-
-void DumpDot::collectOnce(TreeBase* n) {
-    if (workspace.declaredOnce.insert(n)) nodesByKind[n->getNodeType()].push_back(n);
+void DumpDot::collect(TreeBase* n) {
+    NestingLevel level(nesting);
+    if (!level.entered()) return;
+    NodeType k = n->getNodeType();
+    forEachChild(n, k, [this](TreeBase* child) { collect(child); });
+    record(n, k);
 }
 
-void DumpDot::visit(UNOP* n) { AllVisitor::visit(n); collect(n); }
-void DumpDot::visit(TEMP* n) { AllVisitor::visit(n); collectOnce(n); }
-void DumpDot::visit(SUBPROG* n) { AllVisitor::visit(n); collect(n); }
-void DumpDot::visit(SEQ* n) { AllVisitor::visit(n); collect(n); }
-void DumpDot::visit(NAME* n) { AllVisitor::visit(n); collectOnce(n); }
-void DumpDot::visit(MOVE* n) { AllVisitor::visit(n); collect(n); }
-void DumpDot::visit(MEM* n) { AllVisitor::visit(n); collect(n); }
-void DumpDot::visit(LABEL* n) { AllVisitor::visit(n); collectOnce(n); }
-void DumpDot::visit(JUMP* n) { AllVisitor::visit(n); collect(n); }
-void DumpDot::visit(EXP* n) { AllVisitor::visit(n); collect(n); }
-void DumpDot::visit(CONST* n) { AllVisitor::visit(n); collectOnce(n); }
-void DumpDot::visit(CJUMP* n) { AllVisitor::visit(n); collect(n); }
-void DumpDot::visit(CALL* n) { AllVisitor::visit(n); collect(n); }
-void DumpDot::visit(BUF_TEMP* n) { AllVisitor::visit(n); collectOnce(n); }
-void DumpDot::visit(BINOP* n) { AllVisitor::visit(n); collect(n); }
+void DumpDot::record(TreeBase* n, NodeType k) {
+    if (!collectedOnce(k) || workspace.declaredOnce.insert(n)) nodesByKind[k].push_back(n);
+}
 
 // ---- statistics ----
 
 void DumpDot::writeStatistics(std::ostream& os) {
     static const char stars[] = "************************************************************\n";
+    // "Statictics" is misspelt on purpose: existing clients look for it.
     os << "ZOA Statictics for SUBPROG ";
     os.write(subprog->getName().data(), static_cast<std::streamsize>(subprog->getName().size()));
     os << "\n" << stars;
@@ -152,8 +126,9 @@ void DumpDot::writeStatistics(std::ostream& os) {
         if (k == STMT_BASE_NODE) continue;
         std::size_t count = nodesByKind[k].size();
         total += static_cast<long long>(count);
+        std::string_view name = nodeKindName(static_cast<NodeType>(k));
         os << "Total ";
-        os.write(kinds[k].name.data(), static_cast<std::streamsize>(kinds[k].name.size()));
+        os.write(name.data(), static_cast<std::streamsize>(name.size()));
         os << " Nodes: " << count << "\n";
     }
     os << "Total ZOA Nodes: " << total << "\n" << stars;
@@ -167,20 +142,20 @@ void DumpDot::writeGraphHeader() {
     indent(1);
     lit("graph [fontname=\"Helvetica\", fontsize=20,");
     lit(" label = \"");
-    put(subprog->getName());
+    text << subprog->getName();
     lit("\"]\n");
 }
 
 void DumpDot::writeKindBlocks() {
     for (int k = 0; k < NODE_TYPE_COUNT; ++k) {
-        if (!kinds[k].ownBlock || nodesByKind[k].empty()) continue;
+        if (!hasOwnBlock(k) || nodesByKind[k].empty()) continue;
         indent(1);
         lit("subgraph ");
-        putView(text, kinds[k].name);
+        text << nodeKindName(static_cast<NodeType>(k));
         lit("Type {\n");
         indent(2);
         lit("node [color=");
-        putView(text, kinds[k].colour);
+        text << kindColours[k];
         lit(", shape=record];\n");
         for (TreeBase* n : nodesByKind[k]) declareNode(n, 2);
         indent(1);
@@ -192,14 +167,13 @@ void DumpDot::declareNode(TreeBase* n, int depth) {
     NodeType k = n->getNodeType();
     indent(depth);
     lit("node [label = \"{");
-    putView(text, kinds[k].name);
+    text << nodeKindName(k);
     writeFields(n);
     lit("}\"];\n");
     indent(depth);
     putIdentity(n);
     lit(";\n");
     if (k == SUBPROG_NODE) declareTemps(static_cast<SUBPROG*>(n), depth);
-    if (text.size() >= flushThreshold) flushText();
 }
 
 void DumpDot::writeFields(TreeBase* n) {
@@ -207,34 +181,34 @@ void DumpDot::writeFields(TreeBase* n) {
         case UNOP_NODE: {
             auto* u = static_cast<UNOP*>(n);
             lit(" | (");
-            putCString(toString(u->getDataType()));
+            text << (toString(u->getDataType()));
             lit(" / ");
-            putCString(toString(u->getOp()));
+            text << (toString(u->getOp()));
             lit(")");
             break;
         }
         case BINOP_NODE: {
             auto* b = static_cast<BINOP*>(n);
             lit(" | (");
-            putCString(toString(b->getDataType()));
+            text << (toString(b->getDataType()));
             lit(" / ");
-            putCString(toString(b->getOp()));
+            text << (toString(b->getOp()));
             lit(")");
             break;
         }
         case CALL_NODE: {
             auto* c = static_cast<CALL*>(n);
             lit(" | (");
-            putCString(toString(c->getDataType()));
+            text << (toString(c->getDataType()));
             lit(" / ");
-            put(c->getFunctionName());
+            text << c->getFunctionName();
             lit(")");
             break;
         }
         case CONST_NODE: {
             auto* c = static_cast<CONST*>(n);
             lit(" | (");
-            putCString(toString(c->getDataType()));
+            text << (toString(c->getDataType()));
             lit(" / ");
             writeConstValue(c);
             lit(")");
@@ -242,13 +216,13 @@ void DumpDot::writeFields(TreeBase* n) {
         }
         case MEM_NODE:
             lit(" | (");
-            putCString(toString(static_cast<MEM*>(n)->getDataType()));
+            text << (toString(static_cast<MEM*>(n)->getDataType()));
             lit(")");
             break;
         case NAME_NODE: {
             auto* nm = static_cast<NAME*>(n);
             lit(" | (");
-            putCString(toString(nm->getDataType()));
+            text << (toString(nm->getDataType()));
             lit(" / ");
             putUnsigned(nm->getId());
             lit(")");
@@ -257,7 +231,7 @@ void DumpDot::writeFields(TreeBase* n) {
         case TEMP_NODE: {
             auto* t = static_cast<TEMP*>(n);
             lit(" | (");
-            putCString(toString(t->getDataType()));
+            text << (toString(t->getDataType()));
             lit(" / ");
             putUnsigned(t->getId());
             lit(")");
@@ -266,7 +240,7 @@ void DumpDot::writeFields(TreeBase* n) {
         case BUF_TEMP_NODE: {
             auto* t = static_cast<BUF_TEMP*>(n);
             lit(" | (");
-            putCString(toString(t->getDataType()));
+            text << (toString(t->getDataType()));
             lit(" / ");
             putUnsigned(t->getId());
             lit(" / ");
@@ -281,9 +255,9 @@ void DumpDot::writeFields(TreeBase* n) {
         case SUBPROG_NODE: {
             auto* sp = static_cast<SUBPROG*>(n);
             lit(" | (");
-            putCString(toString(sp->getReturnType()));
+            text << (toString(sp->getReturnType()));
             lit(" / ");
-            put(sp->getName());
+            text << sp->getName();
             lit(")");
             break;
         }
@@ -302,7 +276,8 @@ void DumpDot::writeFields(TreeBase* n) {
 void DumpDot::writeConstValue(CONST* c) {
     switch (c->getDataType()) {
         case CHAR_U:
-            text.push_back(static_cast<char>(static_cast<unsigned long long>(c->getIValue()) & 0xffu));
+            // The byte itself, not its number: odd, but what existing DOT files hold.
+            text << static_cast<char>(static_cast<unsigned long long>(c->getIValue()) & 0xffu);
             break;
         case INT_U:
             putUnsigned(static_cast<unsigned long long>(c->getIValue()) & 0xffffffffu);
@@ -323,7 +298,7 @@ void DumpDot::writeConstValue(CONST* c) {
             break;
         case POINTER: {
             const char* s = static_cast<const char*>(c->getPValue());
-            putCString(s ? s : "(char *)0");
+            text << (s ? s : "(char *)0");
             break;
         }
         case VOID:
@@ -336,7 +311,7 @@ void DumpDot::declareTemps(SUBPROG* sp, int depth) {
     if (temps.empty()) return;
     indent(depth);
     lit("node [color=");
-    putView(text, kinds[TEMP_NODE].colour);
+    text << kindColours[TEMP_NODE];
     lit(", shape=record];\n");
     for (TEMP* t : temps)
         if (t) declareNode(t, depth);
@@ -345,6 +320,7 @@ void DumpDot::declareTemps(SUBPROG* sp, int depth) {
 void DumpDot::writeConnections() {
     indent(1);
     lit("subgraph ");
+    // "conections" is misspelt on purpose: existing clients look for it.
     lit("conections {\n");
     for (int k = 0; k < NODE_TYPE_COUNT; ++k)
         for (TreeBase* n : nodesByKind[k]) writeEdges(n, 2);
@@ -358,7 +334,7 @@ void DumpDot::edge(const TreeBase* from, const TreeBase* to, EdgeEnding ending, 
     putIdentity(from);
     lit(" -> ");
     putIdentity(to);
-    putView(text, edgeEndings[ending]);
+    text << edgeEndings[ending];
 }
 
 void DumpDot::writeEdges(TreeBase* n, int depth) {
@@ -432,34 +408,26 @@ void DumpDot::writeEdges(TreeBase* n, int depth) {
         case STMT_BASE_NODE:
             break;
     }
-    if (text.size() >= flushThreshold) flushText();
 }
 
-// ---- text helpers ----
-
-void DumpDot::putCString(const char* s) { text.append(s, std::strlen(s)); }
-
-void DumpDot::indent(int depth) {
-    if (depth > 0) text.fill(' ', static_cast<std::size_t>(depth) * 4);
-}
+// ---- numbers ----
 
 void DumpDot::putUnsigned(unsigned long long v) {
     if (!plainNumbers) {
-        flushText();
+        text.flush();
         out << v;
         return;
     }
-    text.commit(writeDecimal(text.tail(24), v));
+    text.writeUnsigned(v);
 }
 
 void DumpDot::putSigned(long long v) {
     if (!plainNumbers) {
-        flushText();
+        text.flush();
         out << v;
         return;
     }
-    char* at = text.tail(24);
-    text.commit(static_cast<std::size_t>(std::to_chars(at, at + 24, v).ptr - at));
+    text.writeInt(v);
 }
 
 void DumpDot::putIdentity(const TreeBase* n) {
@@ -468,18 +436,12 @@ void DumpDot::putIdentity(const TreeBase* n) {
 
 template <class F> void DumpDot::putFloating(F v) {
     // The stream's own floating-point formatting, whatever its settings.
-    flushText();
+    text.flush();
     out << v;
 }
 
-void DumpDot::flushText() {
-    if (text.empty()) return;
-    out.write(text.data(), static_cast<std::streamsize>(text.size()));
-    text.clear();
-}
-
 bool ZOA_file::dumpDot(std::ostream& os) {
-    DumpDot::Workspace workspace;
+    DumpDot::Workspace workspace(os);
     for (SUBPROG* sp : subprogs) DumpDot dump(sp, os, &workspace, &getDiagnosticStream());
     return true;
 }

@@ -14,6 +14,8 @@ namespace ZOA {
 DecompileC::DecompileC(std::ostream& os, bool isGcc) : DecompileBase(os, isGcc), sink(os) {}
 DecompileC::~DecompileC() {}
 
+void DecompileC::writeCutNote() { sink << "/* " << CUT_NOTE << " */"; }
+
 void DecompileC::writeInt(long long v) { sink.writeInt(v); }
 
 void DecompileC::writeUnsigned(unsigned long long v) { sink.writeUnsigned(v); }
@@ -35,6 +37,11 @@ void DecompileC::printFlat(ExprBase* e) {
 // Statements print their expressions through here: one type query, then a
 // direct call of the printer, where accept would cost two virtual calls.
 void DecompileC::printExpr(ExprBase* e, NodeType t) {
+    NestingLevel level(nesting);
+    if (!level.entered()) {
+        if (level.cutHere()) writeCutNote();
+        return;
+    }
     switch (t) {
     case TEMP_NODE:
     case BUF_TEMP_NODE:

@@ -3,7 +3,7 @@
 #define ZOA_EMIT_C_DECOMPILE_C_H
 
 #include "emit/decompile_base.h"
-#include "emit/text_out.h"
+#include "support/text_sink.h"
 #include "emit/used_temps.h"
 
 #include <zoa/enums.h>
@@ -36,26 +36,16 @@ namespace ZOA {
 //  - A missing child (null expression) prints as nothing; a missing jump
 //    target prints ";" in place of its goto. Nothing ever crashes on a broken
 //    tree.
+//  - Nesting deeper than MAX_WALK_DEPTH (a cycle made with the copy
+//    assignments): "/* <CUT_NOTE> */" where the bound is reached; the rest of
+//    that statement of the label is left out and printing goes on after it.
 class DecompileC : public DecompileBase {
 public:
     DecompileC(std::ostream& os, bool isGcc);
     ~DecompileC() override;
 
-    void visit(UNOP*) override;
-    void visit(TEMP*) override;
-    void visit(SUBPROG*) override;
-    void visit(SEQ*) override;
-    void visit(NAME*) override;
-    void visit(MOVE*) override;
-    void visit(MEM*) override;
-    void visit(LABEL*) override;
-    void visit(JUMP*) override;
-    void visit(EXP*) override;
-    void visit(CONST*) override;
-    void visit(CJUMP*) override;
-    void visit(CALL*) override;
-    void visit(BUF_TEMP*) override;
-    void visit(BINOP*) override;
+#define ZOA_NODE_KIND(kind, Class) void visit(Class*) override;
+#include "core/node_kinds.def"
 
     void defineName(NAME* n) override;
     void declareNamePrototype(NAME* n) override;
@@ -82,6 +72,7 @@ private:
     void printExpr(ExprBase* e, NodeType t);
     // Prints a statement or label, keeping indentLevel as it was.
     void printStmt(StmtBase* s);
+    void writeCutNote() override;
     void printLabel(LABEL* l);
     void writeArgList(CALL* c);
     void writeArgTypes(CALL* c);
@@ -90,11 +81,10 @@ private:
     void writeInt(long long v);
     void writeUnsigned(unsigned long long v);
 
-    // Indentation into sink (the base's indent writes to the stream directly).
-    TextOut& pad(unsigned int n) { return sink.indent(n); }
+    TextSink& pad(unsigned int n) { return sink.indent(n); }
 
     UsedTemps usedTemps;  // reused across subprograms
-    TextOut sink;     // everything this emitter writes goes through it
+    TextSink sink;     // everything this emitter writes goes through it
 };
 
 }  // namespace ZOA

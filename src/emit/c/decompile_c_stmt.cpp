@@ -22,7 +22,7 @@ NAME* asLabelAddress(ExprBase* e) {
 void DecompileC::printStmt(StmtBase* s) {
     if (!s) return;
     unsigned int saved = indentLevel;
-    s->accept(this);
+    acceptNested(s);
     indentLevel = saved;
 }
 
@@ -37,7 +37,7 @@ void DecompileC::writeGoto(LABEL* target, unsigned int level) {
 }
 
 void DecompileC::visit(EXP* e) {
-    if (ExprBase* x = e->getExpr()) x->accept(this);
+    if (ExprBase* x = e->getExpr()) acceptNested(x);
     sink << ";\n";
 }
 
@@ -70,7 +70,7 @@ void DecompileC::visit(MOVE* m) {
     }
     if (dst) {
         unsigned int saved = indentLevel;
-        dst->accept(this);
+        acceptNested(dst);
         indentLevel = saved;
     }
     sink << " = ";
@@ -96,7 +96,7 @@ void DecompileC::visit(JUMP* j) {
         // Load the target into the address temporary, then jump through it.
         if (ExprBase* addr = mem->getExpr()) {
             unsigned int saved = indentLevel;
-            addr->accept(this);
+            acceptNested(addr);
             indentLevel = saved;
         }
         sink << " = ";
@@ -167,7 +167,7 @@ void DecompileC::declareTemp(TEMP* t) {
 }
 
 void DecompileC::visit(SUBPROG* sp) {
-    TextOut::Batch batch(sink);
+    TextSink::Batch batch(sink);
     if (sp->isStatic()) sink << "static ";
     if (sp->isExtern()) sink << "extern ";
     writeTypeName(sp->getReturnType());

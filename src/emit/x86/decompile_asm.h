@@ -3,7 +3,7 @@
 #define ZOA_EMIT_X86_DECOMPILE_ASM_H
 
 #include "emit/decompile_base.h"
-#include "emit/text_out.h"
+#include "support/text_sink.h"
 #include "emit/used_temps.h"
 
 #include <zoa/expr.h>
@@ -62,6 +62,9 @@ enum RegClass { LOW_BYTE = 0, HIGH_BYTE = 1, DWORD = 2, QWORD = 3 };
 //    operator. A TEMP that has no frame slot still prints t<id>[ebp] and so
 //    leaves an undefined symbol for the assembler to report.
 //  - Unknown register numbers print "unknown register" (bracketed or not).
+//  - Nesting deeper than MAX_WALK_DEPTH (a cycle made with the copy
+//    assignments): a line "# <CUT_NOTE>" where the bound is reached; the rest
+//    of that statement of the label is left out.
 class DecompileASM : public DecompileBase {
 public:
     // Where an expression's value is. Arena-allocated; stays on the node.
@@ -84,21 +87,8 @@ public:
     // Where the per-subprogram note goes (std::cout unless set).
     void setNoteStream(std::ostream& os) { notes = &os; }
 
-    void visit(UNOP*) override;
-    void visit(TEMP*) override;
-    void visit(SUBPROG*) override;
-    void visit(SEQ*) override;
-    void visit(NAME*) override;
-    void visit(MOVE*) override;
-    void visit(MEM*) override;
-    void visit(LABEL*) override;
-    void visit(JUMP*) override;
-    void visit(EXP*) override;
-    void visit(CONST*) override;
-    void visit(CJUMP*) override;
-    void visit(CALL*) override;
-    void visit(BUF_TEMP*) override;
-    void visit(BINOP*) override;
+#define ZOA_NODE_KIND(kind, Class) void visit(Class*) override;
+#include "core/node_kinds.def"
 
     void defineName(NAME* n) override;
     void declareNamePrototype(NAME* n) override;
@@ -128,7 +118,7 @@ public:
     static unsigned int valueSize(ExprBase* e);
     static const char* sizePrefix(ExprBase* e);
     static const char* dataDirective(DataType t);
-    static bool isSignedType(ExprBase* e);
+    static bool isSignedValue(ExprBase* e);
     std::string operandText(ExprBase* e, bool useRegister);
     std::string byteOperandText(ExprBase* e);
     void writeTempSymbol(TEMP* t);
@@ -170,7 +160,7 @@ private:
     // line is gathered in the sink and handed to the stream whole at its end,
     // followed by a flush of the stream, as std::endl would: whoever reads the
     // stream sees every line as soon as it is complete.
-    TextOut& line() { return sink.indent(indentLevel); }
+    TextSink& line() { return sink.indent(indentLevel); }
     void endLine() {
         sink << '\n';
         sink.flush();
@@ -185,7 +175,10 @@ private:
     void putAddress(MEM* mem);  // "[A op B]"
     void putLabel(LABEL* l);
 
-    void visitExpr(ExprBase* e) { if (e) e->accept(this); }
+    void visitExpr(ExprBase* e) {
+        if (e) acceptNested(e);
+    }
+    void writeCutNote() override;
     void writeEpilogue();
     void writeAlloca(CALL* c);
 
@@ -201,8 +194,8 @@ private:
 
     std::ostream* notes;
     UsedTemps used;  // reused across subprograms
-    TextOut sink;
-    TextOut::Batch lines{sink};  // the sink gathers until endLine for the emitter's lifetime
+    TextSink sink;
+    TextSink::Batch lines{sink};  // the sink gathers until endLine for the emitter's lifetime
 };
 
 }  // namespace ZOA

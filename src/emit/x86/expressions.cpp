@@ -1,37 +1,21 @@
 // The assembly emitter's expressions: buffers, memory reads, widening, operators and addresses.
 #include "emit/x86/decompile_asm.h"
 
+#include "core/type_facts.h"
+#include "emit/x86/conditions.h"
+
 #include <ostream>
 
 namespace ZOA {
 
 namespace {
 
-// By BinopKind: the instruction of an operator, or null without instruction
-// selection; isCompare marks the relations, written as cmp + set + movzx.
-struct BinopForm {
-    const char* mnemonic;
-    bool isCompare;
-};
-const BinopForm binopForms[MAX_BINOP] = {
-    {"add ", false},   // PLUS
-    {"sub ", false},   // MINUS
-    {nullptr, false},  // MUL: handled on its own
-    {nullptr, false},  // DIV
-    {nullptr, false},  // MOD
-    {nullptr, false},  // AND
-    {nullptr, false},  // OR
-    {"sete ", true},   // EQ
-    {"setne ", true},  // NE
-    {"setl ", true},   // LT
-    {"setle ", true},  // LE
-    {"setg ", true},   // GT
-    {"setge ", true},  // GE
-    {nullptr, false},  // LSHIFT
-    {nullptr, false},  // RSHIFT
-    {nullptr, false},  // BITWISE_AND
-    {nullptr, false},  // BITWISE_OR
-    {nullptr, false},  // XOR
+// By BinopKind: the two-operand instruction of PLUS and MINUS; null for the
+// rest (the relations are written as cmp + set<cc> + movzx, MUL on its own,
+// the others without instruction selection).
+const char* const binopMnemonics[MAX_BINOP] = {
+    "add ",   // PLUS
+    "sub ",   // MINUS
 };
 
 const char* addressOperator(BinopKind op) {
@@ -124,23 +108,23 @@ AsmRegister DecompileASM::emitBinop(BinopKind op, ExprBase* l, ExprBase* r) {
         }
     }
     unsigned int index = static_cast<unsigned int>(op);
-    const BinopForm* form = index < MAX_BINOP ? &binopForms[index] : nullptr;
+    const char* mnemonic = index < MAX_BINOP ? binopMnemonics[index] : nullptr;
     if (op == MUL) {
         if (regOf(l) != EAX) {
             claimRegister(EAX);
             DataType t = l ? l->getDataType() : VOID;
-            if (t == CHAR_U || t == CHAR_S) {
+            if (isByteType(t)) {
                 line() << "movzx eax, ";
                 putOperand(l, true);
                 endLine();
-            } else if (t == INT_U || t == INT_S) {
+            } else if (isInt32Type(t)) {
                 line() << "mov eax, ";
                 putOperand(l, true);
                 endLine();
             }
             assignRegister(l, EAX, false);
         }
-        if (isSignedType(l)) {
+        if (isSignedValue(l)) {
             line() << "imul ";
             putReg(regOf(l));
             put(", ");
@@ -158,16 +142,16 @@ AsmRegister DecompileASM::emitBinop(BinopKind op, ExprBase* l, ExprBase* r) {
             endLine();
         }
         result = regOf(l);
-    } else if (form && form->mnemonic && !form->isCompare) {
+    } else if (mnemonic) {
         AsmRegister L = regOf(l);
-        line() << form->mnemonic;
+        line() << mnemonic;
         putReg(L);
         put(", ");
         putOperand(r, true);
         endLine();
         result = L;
         freeRegister(L);
-    } else if (form && form->isCompare) {
+    } else if (isRelation(op)) {
         line() << "cmp ";
         putReg(regOf(l));
         put(", ");
@@ -175,7 +159,7 @@ AsmRegister DecompileASM::emitBinop(BinopKind op, ExprBase* l, ExprBase* r) {
         endLine();
         AsmRegister b = allocateByte();
         AsmRegister w = registerOfClass(b, DWORD);
-        line() << form->mnemonic;
+        line() << "set" << conditionCode(op) << ' ';
         putReg(b);
         endLine();
         line() << "movzx ";

@@ -1,9 +1,11 @@
 // The assembly emitter's operands: type tables, operand texts, leaf visits and file-level data.
 #include "emit/x86/decompile_asm.h"
 
+#include "core/type_facts.h"
+#include "support/decimal.h"
+
 #include <zoa/stmt.h>
 
-#include <charconv>
 #include <cstdio>
 #include <cstring>
 #include <ostream>
@@ -13,30 +15,29 @@ namespace ZOA {
 
 namespace {
 
-struct TypeInfo {
-    unsigned int size;       // bytes of a value
-    std::string_view prefix; // size keyword of a memory operand
-    const char* directive;   // data directive of one element
-    bool isSigned;
+// The assembler's texts of a DataType; sizes and signedness are typeFacts'.
+struct TypeTexts {
+    std::string_view prefix;  // size keyword of a memory operand
+    const char* directive;    // data directive of one element
 };
 
-const TypeInfo typeInfos[DATA_TYPE_COUNT + 1] = {
-    {1, "BYTE PTR ", ".byte ", false},    // CHAR_U
-    {4, "DWORD PTR ", ".int ", false},    // INT_U
-    {8, "DWORD PTR ", ".quad ", false},   // INT64_U
-    {1, "BYTE PTR ", ".byte ", true},     // CHAR_S
-    {4, "DWORD PTR ", ".int ", true},     // INT_S
-    {8, "DWORD PTR ", ".quad ", true},    // INT64_S
-    {4, "", ".float ", true},             // FLOAT
-    {8, "", ".double ", true},            // DOUBLE
-    {4, "DWORD PTR ", ".long ", false},   // POINTER
-    {0, "", "", false},                   // VOID
-    {0, "", "", false},                   // anything outside the enumeration
+const TypeTexts typeTexts[DATA_TYPE_COUNT + 1] = {
+    {"BYTE PTR ", ".byte "},    // CHAR_U
+    {"DWORD PTR ", ".int "},    // INT_U
+    {"DWORD PTR ", ".quad "},   // INT64_U
+    {"BYTE PTR ", ".byte "},    // CHAR_S
+    {"DWORD PTR ", ".int "},    // INT_S
+    {"DWORD PTR ", ".quad "},   // INT64_S
+    {"", ".float "},            // FLOAT
+    {"", ".double "},           // DOUBLE
+    {"DWORD PTR ", ".long "},   // POINTER
+    {"", ""},                   // VOID
+    {"", ""},                   // anything outside the enumeration
 };
 
-const TypeInfo& infoOf(DataType t) {
+const TypeTexts& textsOf(DataType t) {
     unsigned int i = static_cast<unsigned int>(t);
-    return typeInfos[i < DATA_TYPE_COUNT ? i : DATA_TYPE_COUNT];
+    return typeTexts[i < DATA_TYPE_COUNT ? i : DATA_TYPE_COUNT];
 }
 
 struct NameForm {
@@ -56,17 +57,6 @@ const NameForm nameForms[] = {
 };
 constexpr unsigned int NAME_KIND_COUNT = sizeof(nameForms) / sizeof(nameForms[0]);
 
-void appendNumber(String& s, unsigned int v) {
-    char buf[16];
-    auto r = std::to_chars(buf, buf + sizeof buf, v);
-    s.append(buf, static_cast<std::size_t>(r.ptr - buf));
-}
-
-// Plain decimal of an integer: the bytes printf's %d, %u, %llu or %lld give.
-template <class T> int decimal(char (&buf)[64], T v) {
-    return static_cast<int>(std::to_chars(buf, buf + sizeof buf, v).ptr - buf);
-}
-
 // memText of a NAME (see the class comment).
 void setNameText(NAME* n, String& text) {
     unsigned int kind = static_cast<unsigned int>(n->getKind());
@@ -75,12 +65,12 @@ void setNameText(NAME* n, String& text) {
     text = form.prefix;
     if (n->getKind() == LABEL_REF) {
         text += ".La";
-        appendNumber(text, n->getId());
+        appendDecimal(text, n->getId());
     } else if (form.fromText && !n->getStringValue().empty()) {
         text += n->getStringValue();
     } else {
         text += n->isDeclaredLocal() ? "nl" : "ng";
-        appendNumber(text, n->getId());
+        appendDecimal(text, n->getId());
     }
 }
 
@@ -89,17 +79,17 @@ void setNameText(NAME* n, String& text) {
 unsigned int DecompileASM::valueSize(ExprBase* e) {
     if (!e) return 0;
     if (e->getNodeType() == BUF_TEMP_NODE) return static_cast<BUF_TEMP*>(e)->getArraySize();
-    return infoOf(e->getDataType()).size;
+    return sizeOfType(e->getDataType());
 }
 
-std::string_view DecompileASM::sizePrefixText(ExprBase* e) { return e ? infoOf(e->getDataType()).prefix : ""; }
+std::string_view DecompileASM::sizePrefixText(ExprBase* e) { return e ? textsOf(e->getDataType()).prefix : ""; }
 
 // The table's texts are literals, so the view's data is terminated.
 const char* DecompileASM::sizePrefix(ExprBase* e) { return sizePrefixText(e).data(); }
 
-const char* DecompileASM::dataDirective(DataType t) { return infoOf(t).directive; }
+const char* DecompileASM::dataDirective(DataType t) { return textsOf(t).directive; }
 
-bool DecompileASM::isSignedType(ExprBase* e) { return e && infoOf(e->getDataType()).isSigned; }
+bool DecompileASM::isSignedValue(ExprBase* e) { return e && isSignedType(e->getDataType()); }
 
 DecompileASM::ExprAnnotation* DecompileASM::annotationOf(const ExprBase* e) {
     TreeAnnotation* a = e ? e->getAnnotation() : nullptr;
@@ -172,10 +162,18 @@ void DecompileASM::writeTempSymbol(TEMP* t) {
     endLine();
 }
 
+// Nodes carry no comments (TreeBase::getComment is always null), so this
+// writes nothing today; it stays as the one place where a node's comment
+// would become a "# CONST: ..." line, should nodes ever keep one.
 void DecompileASM::writeNodeComment(TreeBase* node) {
     const char* comment = node ? node->getComment() : nullptr;
     if (!comment || !*comment) return;
     line() << "# CONST: " << comment;
+    endLine();
+}
+
+void DecompileASM::writeCutNote() {
+    line() << "# " << CUT_NOTE;
     endLine();
 }
 
@@ -195,10 +193,10 @@ void DecompileASM::visit(CONST* c) {
     case CHAR_S:
     case INT_S:
         // The low 32 bits as a signed int, as printf's "%d" shows them.
-        n = decimal(buf, static_cast<int>(static_cast<unsigned int>(c->getIValue())));
+        n = static_cast<int>(writeDecimal(buf, static_cast<long long>(static_cast<int>(static_cast<unsigned int>(c->getIValue())))));
         break;
-    case INT64_U: n = decimal(buf, static_cast<unsigned long long>(c->getIValue())); break;
-    case INT64_S: n = decimal(buf, c->getIValue()); break;
+    case INT64_U: n = static_cast<int>(writeDecimal(buf, static_cast<unsigned long long>(c->getIValue()))); break;
+    case INT64_S: n = static_cast<int>(writeDecimal(buf, c->getIValue())); break;
     case FLOAT:
     case DOUBLE:
         // A huge double needs more room than buf: print it into memText itself.
@@ -229,7 +227,7 @@ void DecompileASM::visit(TEMP* t) {
     ExprAnnotation* a = ensureAnnotation(t);
     if (a->reg != NO_REGISTER || !a->memText.empty()) return;
     a->memText = "t";
-    appendNumber(a->memText, t->getId());
+    appendDecimal(a->memText, t->getId());
     a->memText += "[ebp]";
 }
 
@@ -257,7 +255,7 @@ void DecompileASM::defineName(NAME* n) {
         line() << ".type " << sym << ",@object";
         endLine();
         line() << ".size " << sym << ',';
-        putUnsigned(values.size() * ExprBase::sizeOfDataType(t));
+        putUnsigned(values.size() * sizeOfType(t));
         endLine();
         sink << sym << ':';
         endLine();
@@ -289,7 +287,7 @@ void DecompileASM::defineName(NAME* n) {
         return;
     case STATIC_DATA_REF: {
         if (values.empty()) return;
-        unsigned int size = ExprBase::sizeOfDataType(n->getDataType());
+        unsigned int size = sizeOfType(n->getDataType());
         line() << ".section .rodata";
         endLine();
         line() << ".align ";

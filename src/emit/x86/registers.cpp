@@ -1,6 +1,8 @@
 // The assembly emitter's register model: names, aliasing, reservation, allocation and loads.
 #include "emit/x86/decompile_asm.h"
 
+#include "core/type_facts.h"
+
 #include <cstdint>
 #include <string_view>
 
@@ -192,22 +194,14 @@ AsmRegister DecompileASM::allocateQword() {
 
 namespace {
 enum Width { BYTE_WIDTH, DWORD_WIDTH, QWORD_WIDTH, NO_WIDTH };
-// Register width by DataType.
-const Width widthOfType[DATA_TYPE_COUNT] = {
-    BYTE_WIDTH,   // CHAR_U
-    DWORD_WIDTH,  // INT_U
-    QWORD_WIDTH,  // INT64_U
-    BYTE_WIDTH,   // CHAR_S
-    DWORD_WIDTH,  // INT_S
-    QWORD_WIDTH,  // INT64_S
-    DWORD_WIDTH,  // FLOAT
-    QWORD_WIDTH,  // DOUBLE
-    DWORD_WIDTH,  // POINTER
-    NO_WIDTH,     // VOID
-};
+// The register width of e's type: FLOAT and POINTER in a dword, DOUBLE in a qword.
 Width widthOf(const ExprBase* e) {
-    unsigned int t = e ? static_cast<unsigned int>(e->getDataType()) : DATA_TYPE_COUNT;
-    return t < DATA_TYPE_COUNT ? widthOfType[t] : NO_WIDTH;
+    switch (e ? sizeOfType(e->getDataType()) : 0) {
+    case 1: return BYTE_WIDTH;
+    case 4: return DWORD_WIDTH;
+    case 8: return QWORD_WIDTH;
+    default: return NO_WIDTH;
+    }
 }
 }  // namespace
 

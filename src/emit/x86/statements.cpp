@@ -1,6 +1,9 @@
 // The assembly emitter's statements: labels, sequences, moves, jumps and conditional jumps.
 #include "emit/x86/decompile_asm.h"
 
+#include "core/type_facts.h"
+#include "emit/x86/conditions.h"
+
 #include <zoa/stmt.h>
 
 #include <ostream>
@@ -15,7 +18,7 @@ bool isAddressedByBinop(ExprBase* e) {
     return isKind(e, MEM_NODE) && isKind(static_cast<MEM*>(e)->getExpr(), BINOP_NODE);
 }
 
-bool isByteType(ExprBase* e) { return e && (e->getDataType() == CHAR_U || e->getDataType() == CHAR_S); }
+bool holdsByte(ExprBase* e) { return e && isByteType(e->getDataType()); }
 
 bool isDwordRegister(AsmRegister r) { return r >= EAX && r <= ESP; }
 
@@ -34,13 +37,6 @@ unsigned int shapesOf(ExprBase* e) {
     }
 }
 
-// By relOp: the conditional jump mnemonic, null for a non-relation.
-const char* jumpMnemonic(BinopKind rel) {
-    static const char* const mnemonics[] = {"je ", "jne ", "jl ", "jle ", "jg ", "jge "};
-    unsigned int i = static_cast<unsigned int>(rel);
-    return i >= EQ && i <= GE ? mnemonics[i - EQ] : nullptr;
-}
-
 }  // namespace
 
 void DecompileASM::visit(LABEL* l) {
@@ -51,7 +47,7 @@ void DecompileASM::visit(LABEL* l) {
     resetRegisters();
     if (l->containsStmts())
         for (StmtBase* s : l->getStmts())
-            if (s) s->accept(this);
+            if (s) acceptNested(s);
     if (l->getKind() == EPILOGUE_LABEL) writeEpilogue();
 }
 
@@ -59,7 +55,7 @@ void DecompileASM::visit(SEQ* s) {
     for (StmtBase* part : {s->getLeft(), s->getRight()}) {
         if (!part) continue;
         releaseStatementRegisters(part);
-        part->accept(this);
+        acceptNested(part);
     }
 }
 
@@ -199,7 +195,7 @@ void DecompileASM::moveTempFromBinop(ExprBase* d, ExprBase* s) {
     line() << "mov ";
     putOperand(d, false);
     put(", ");
-    if (d != b->getLeft() && d != b->getRight() && isByteType(d) && isDwordRegister(R)) {
+    if (d != b->getLeft() && d != b->getRight() && holdsByte(d) && isDwordRegister(R)) {
         put("BYTE PTR ");
         putReg(registerOfClass(R, LOW_BYTE));
     } else {
@@ -218,7 +214,7 @@ void DecompileASM::moveOther(ExprBase* d, ExprBase* s) {
     line() << "mov ";
     putOperand(d, !toTemp);
     put(", ");
-    if (R == NO_REGISTER || !isByteType(d) || !isDwordRegister(R)) {
+    if (R == NO_REGISTER || !holdsByte(d) || !isDwordRegister(R)) {
         putOperand(s, true);
     } else {
         put("BYTE PTR ");
@@ -280,7 +276,7 @@ void DecompileASM::visit(CJUMP* c) {
     endLine();
 
     if (c->getIfTrue()) {
-        if (const char* mnemonic = jumpMnemonic(c->getRelOp())) line() << mnemonic;
+        if (isRelation(c->getRelOp())) line() << 'j' << conditionCode(c->getRelOp()) << ' ';
         putLabel(c->getIfTrue());
         endLine();
     }

@@ -1,6 +1,6 @@
 // copyShort: memcpy for the short pieces output paths append, without a library call.
-#ifndef ZOA_CORE_SHORT_COPY_H
-#define ZOA_CORE_SHORT_COPY_H
+#ifndef ZOA_SUPPORT_SHORT_COPY_H
+#define ZOA_SUPPORT_SHORT_COPY_H
 
 #include <cstddef>
 #include <cstdint>
