@@ -2,6 +2,7 @@
 #include "emit/x86/sound/sound_x86.h"
 
 #include "core/op_facts.h"
+#include "emit/x86/conditions.h"
 
 #include <cstdint>
 #include <cstring>
@@ -10,7 +11,7 @@ namespace ZOA {
 
 using ctypes::CT;
 
-void SoundX86::setFlag(const char* cc) {
+void SoundX86::setFlag(std::string_view cc) {
     ins() << "set" << cc << "\tal\n";
     ins() << "movzx\teax, al\n";
 }
@@ -102,6 +103,12 @@ SoundX86::VT SoundX86::value(ExprBase* e) {
 
 SoundX86::VT SoundX86::gen(ExprBase* e) {
     if (!e) return VT{};
+    NestingLevel level(nesting);
+    if (!level.entered()) {  // a cycle: a zero stands for what is not followed
+        if (level.cutHere()) writeCutNote();
+        ins() << "xor\teax, eax\n";
+        return VT{CT::INT, 1};
+    }
     switch (e->getNodeType()) {
     case CONST_NODE: return genConst(static_cast<CONST*>(e));
     case NAME_NODE: return genName(static_cast<NAME*>(e));
@@ -324,8 +331,7 @@ bool SoundX86::genDirect(BinopKind op, VT a, ExprBase* r, VT& result) {
         directOperand(r);
         end();
         if (isRelation(op)) {
-            static const char* const cc[] = {"e", "ne", "b", "be", "a", "ae"};
-            setFlag(cc[op - EQ]);
+            setFlag(UNSIGNED_CONDITION_CODES[op - EQ]);
             result = VT{CT::INT, 1};
         } else {
             result = a;
@@ -371,9 +377,7 @@ bool SoundX86::genDirect(BinopKind op, VT a, ExprBase* r, VT& result) {
     }
     result = VT{c, 1};
     if (isRelation(op)) {
-        static const char* const signedCc[] = {"e", "ne", "l", "le", "g", "ge"};
-        static const char* const unsignedCc[] = {"e", "ne", "b", "be", "a", "ae"};
-        setFlag((sign ? signedCc : unsignedCc)[op - EQ]);
+        setFlag((sign ? CONDITION_CODES : UNSIGNED_CONDITION_CODES)[op - EQ]);
         result = VT{CT::INT, 1};
     }
     return true;
@@ -503,10 +507,8 @@ SoundX86::VT SoundX86::genCompare(BinopKind op, VT a, VT b) {
         drop(bytes);
         return VT{CT::INT, 1};
     }
-    static const char* const signedCc[] = {"e", "ne", "l", "le", "g", "ge"};
-    static const char* const unsignedCc[] = {"e", "ne", "b", "be", "a", "ae"};
     ins() << "cmp\teax, DWORD PTR [esp]\n";
-    setFlag((sign ? signedCc : unsignedCc)[op - EQ]);
+    setFlag((sign ? CONDITION_CODES : UNSIGNED_CONDITION_CODES)[op - EQ]);
     drop(bytes);
     return VT{CT::INT, 1};
 }

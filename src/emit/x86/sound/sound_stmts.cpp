@@ -1,7 +1,6 @@
 // SoundX86: the frame of a subprogram, its statements and its return.
 #include "emit/x86/sound/sound_x86.h"
 
-#include "core/children.h"
 #include "core/op_facts.h"
 #include "core/type_facts.h"
 
@@ -12,53 +11,34 @@ namespace ZOA {
 using ctypes::CT;
 
 // Arguments sit above the return address in 4- or 8-byte slots; locals below
-// the saved ebx, esi and edi. The caller keeps esp 16-byte aligned at the
+// the saved ebx, esi and edi, each given its slot when first used (the frame's
+// size is set after the body). The caller keeps esp 16-byte aligned at the
 // call, so ebp is 8 modulo 16 and offsets are chosen for the alignment wanted.
 void SoundX86::layoutFrame(SUBPROG* sp) {
     slots.clear();
+    below = 12;
     long long argOffset = 8;
     for (TEMP* t : sp->getAllArgTemps()) {
         if (!t) continue;
         slots.emplace(t, argOffset);
         argOffset += slotBytes(ctypes::ctOf(t->getDataType()));
     }
-    long long below = 12;
-    auto place = [&](TEMP* t) {
-        if (slots.count(t)) return;
-        long long size = 8;
-        long long align = 8;
-        if (t->getNodeType() == BUF_TEMP_NODE) {
-            size = (static_cast<long long>(static_cast<BUF_TEMP*>(t)->getArraySize()) + 7) / 8 * 8;
-            if (size == 0) size = 8;
-            align = 16;
-        }
-        below += size;
-        while ((8 - below) % align != 0) below += 4;
-        slots.emplace(t, -below);
-    };
-    for (TEMP* t : sp->getAllTemps())
-        if (t && t->getType() != ARGUMENT_TEMP) place(t);
-    // Temporaries the tree uses without their subprogram's pool knowing them.
-    walk.clear();
-    walk.push_back(sp);
-    while (!walk.empty()) {
-        TreeBase* n = walk.back();
-        walk.pop_back();
-        NodeType k = n->getNodeType();
-        if (k == TEMP_NODE || k == BUF_TEMP_NODE) {
-            place(static_cast<TEMP*>(n));
-            continue;
-        }
-        if (k == NAME_NODE) continue;  // data values are written as data
-        forEachChild(n, [this](TreeBase* c) { walk.push_back(c); });
-    }
-    frameBytes = below - 12;
-    frameBytes += (12 - frameBytes % 16 + 16) % 16;
 }
 
 long long SoundX86::slotOf(TEMP* t) {
     auto it = slots.find(t);
-    return it == slots.end() ? -12 : it->second;  // unreachable: layoutFrame saw every temporary
+    if (it != slots.end()) return it->second;
+    long long size = 8;
+    long long align = 8;
+    if (t->getNodeType() == BUF_TEMP_NODE) {
+        size = (static_cast<long long>(static_cast<BUF_TEMP*>(t)->getArraySize()) + 7) / 8 * 8;
+        if (size == 0) size = 8;
+        align = 16;
+    }
+    below += size;
+    while ((8 - below) % align != 0) below += 4;
+    slots.emplace(t, -below);
+    return -below;
 }
 
 void SoundX86::store(CT t, const char* base, long long offset) {
@@ -107,6 +87,11 @@ void SoundX86::storeTemp(TEMP* t, VT v) {
 
 void SoundX86::statement(StmtBase* s) {
     if (!s) return;
+    NestingLevel level(nesting);
+    if (!level.entered()) {  // a cycle: the rest of the statement is left out
+        if (level.cutHere()) writeCutNote();
+        return;
+    }
     switch (s->getNodeType()) {
     case SEQ_NODE:
         statement(static_cast<SEQ*>(s)->getLeft());

@@ -1,6 +1,7 @@
 // SoundX86: the unit's layout, the subprogram frame and the shared text helpers.
 #include "emit/x86/sound/sound_x86.h"
 
+#include <zoa/nesting.h>
 #include <zoa/stmt.h>
 
 #include <unordered_set>
@@ -57,6 +58,8 @@ void SoundX86::labelRef(const LABEL* l) {
 
 void SoundX86::mnemonic(const char* m) { ins() << m; }
 
+void SoundX86::writeCutNote() { sink << "# " << CUT_NOTE << '\n'; }
+
 std::string SoundX86::internalLabel() { return ".Lz" + std::to_string(internalCount++); }
 
 void SoundX86::memOperand(const char* size, const char* base, long long offset) {
@@ -77,8 +80,8 @@ void SoundX86::visit(SUBPROG* sp) {
     ins() << "push\tebx\n";
     ins() << "push\tesi\n";
     ins() << "push\tedi\n";
-    ins() << "sub\tesp, ";
-    num(frameBytes);
+    ins() << "sub\tesp, OFFSET .Lf";  // the frame's size, set after the body
+    sink.writeUnsigned(subprogIndex);
     end();
     ins() << "call\t__x86.get_pc_thunk.bx\n";
     ins() << "add\tebx, OFFSET FLAT:_GLOBAL_OFFSET_TABLE_\n";
@@ -98,7 +101,14 @@ void SoundX86::visit(SUBPROG* sp) {
         any = true;
     }
     if (any) ins() << "ud2\n";
-    sink << "\t.size\t" << name << ", .-" << name << '\n';
+    // Locals down to `below`, then esp 16-byte aligned: 12 modulo 16 below the saved registers.
+    long long frame = below - 12;
+    frame += (12 - frame % 16 + 16) % 16;
+    sink << "\t.set\t.Lf";
+    sink.writeUnsigned(subprogIndex);
+    sink << ", ";
+    num(frame);
+    sink << "\n\t.size\t" << name << ", .-" << name << '\n';
     defineLocalNames(sp);
     writeStringPool();
 }

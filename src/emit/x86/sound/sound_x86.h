@@ -4,7 +4,7 @@
 
 #include "core/c_types.h"
 #include "emit/decompile_base.h"
-#include "emit/text_out.h"
+#include "support/text_sink.h"
 
 #include <zoa/expr.h>
 #include <zoa/subprog.h>
@@ -12,6 +12,7 @@
 #include <cstdint>
 #include <list>
 #include <string>
+#include <string_view>
 #include <unordered_map>
 #include <vector>
 
@@ -57,10 +58,11 @@ public:
     void declareNamePrototype(NAME*) override {}
     void declareSubprogPrototype(SUBPROG*) override {}
     void declareCallPrototype(CALL*) override {}
+    void writeCutNote() override;
 
 private:
     // ---- text (sound_x86.cpp)
-    TextOut& ins() { return sink << '\t'; }
+    TextSink& ins() { return sink << '\t'; }
     void end() { sink << '\n'; }
     void num(long long v) { sink.writeInt(v); }
     void mnemonic(const char* m);  // a tab and m (out of line: a chosen text of unknown length)
@@ -81,7 +83,7 @@ private:
 
     // ---- frame and statements (sound_stmts.cpp)
     void layoutFrame(SUBPROG* sp);
-    long long slotOf(TEMP* t);
+    long long slotOf(TEMP* t);  // a slot is given on first use
     void statement(StmtBase* s);
     void move(MOVE* m);
     void returnSequence();
@@ -116,7 +118,7 @@ private:
     void pop(CT t);
     void drop(unsigned bytes);
     void discard(CT t);
-    void setFlag(const char* cc);  // set<cc> al; movzx eax, al
+    void setFlag(std::string_view cc);  // set<cc> al; movzx eax, al
 
     // ---- calls (sound_calls.cpp)
     VT genCall(CALL* c);
@@ -129,16 +131,15 @@ private:
     static unsigned stackBytes(CT t) { return t == CT::VOID ? 0 : ctypes::isReal(t) ? 8 : slotBytes(t); }
     std::vector<CT> paramStack;  // the parameter types of the calls being written
 
-    TextOut sink;
-    TextOut::Batch batch{sink};
+    TextSink sink;
+    TextSink::Batch batch{sink};
     std::unordered_map<const LABEL*, unsigned> labelOwner;  // label -> subprogram index
     std::unordered_map<std::string, SUBPROG*> subprogByName;  // the first of each name
     std::unordered_map<const TEMP*, long long> slots;  // ebp offsets
-    std::vector<TreeBase*> walk;                        // scratch for layoutFrame
+    long long below = 12;  // bytes of the frame below ebp so far
     unsigned subprogIndex = 0;
     unsigned internalCount = 0;
     unsigned depth = 0;  // bytes below the frame's aligned bottom
-    long long frameBytes = 0;
 };
 
 }  // namespace ZOA
