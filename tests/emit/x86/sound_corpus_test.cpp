@@ -3,9 +3,11 @@
 #include "corpus.h"
 #include "sound_util.h"
 
+#include <zoa/nesting.h>
 #include <zoa/text.h>
 
 #include <fstream>
+#include <functional>
 #include <iterator>
 
 using namespace ZOA;
@@ -103,6 +105,49 @@ TEST(SoundAsm, AssemblyCorpusRunsItsDrivers) {
         u.build(unit);
         std::string text = soundAsm(unit);
         EXPECT_EQ(runWithC({text}, {u.driver}), u.expected) << text;
+    }
+}
+
+}  // namespace
+
+namespace {
+
+// A cycle made with the copy assignments ends at the depth bound with the
+// note; the statements after it are still written, and the text assembles.
+TEST(SoundAsm, CyclesEndWithANoteAndTheTextAssembles) {
+    std::vector<std::function<StmtBase*(SUBPROG*)>> cycles = {
+        [](SUBPROG*) -> StmtBase* {
+            SEQ* s = new SEQ(nullptr, nullptr);
+            *s = SEQ(s, s);
+            return s;
+        },
+        [](SUBPROG* sp) -> StmtBase* {
+            TEMP* x = sp->getTemp(INT_S, 0, IN_USE_TEMP);
+            BINOP* b = new BINOP(INT_S, MINUS, x, x);
+            *b = BINOP(INT_S, MINUS, b, b);
+            return new MOVE(x, b);
+        },
+        [](SUBPROG* sp) -> StmtBase* {
+            TEMP* p = sp->getTemp(POINTER, 0, IN_USE_TEMP);
+            MEM* m = new MEM(INT_S, p);
+            CALL* c = new CALL(POINTER, "g", {m});
+            *m = MEM(INT_S, c);
+            return new MOVE(new MEM(INT_S, p), m);
+        },
+    };
+    for (auto& cycle : cycles) {
+        ZOA_file unit(true, true);
+        SUBPROG* sp = unit.createSubprog(INT_S, "f", false);
+        sp->getStartLabel()->addStmt(cycle(sp));
+        sp->getStartLabel()->addStmt(new MOVE(sp->getReturnTemp(), new CONST(2)));
+        std::string text = soundAsm(unit);
+        std::size_t notes = 0;
+        for (std::size_t at = text.find(CUT_NOTE); at != std::string::npos; at = text.find(CUT_NOTE, at + 1)) ++notes;
+        EXPECT_EQ(notes, 1u);
+        EXPECT_NE(text.find("mov\teax, 2\n"), std::string::npos);
+        std::string dir = scratchDir();
+        CommandResult r = runCommand("as --32 -o '" + dir + "/c.o' '" + writeFile(dir, "c.s", text) + "'");
+        EXPECT_EQ(r.status, 0) << r.output;
     }
 }
 
