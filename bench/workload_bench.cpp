@@ -62,12 +62,13 @@ void BM_Build(benchmark::State& state) {
     report(state, shape, 0);
 }
 
-enum Output { C_GCC, ASM, ASCII, DOT };
+enum Output { C_GCC, ASM, SOUND_ASM, ASCII, DOT };
 
 template <Output K> void write(ZOA_file& unit, std::ostream& os) {
     switch (K) {
     case C_GCC:
-    case ASM: unit.decompile(os); break;
+    case ASM:
+    case SOUND_ASM: unit.decompile(os); break;
     case ASCII: unit.dumpAscii(os); break;
     case DOT: unit.dumpDot(os); break;
     }
@@ -82,13 +83,13 @@ template <Output K> void BM_Output(benchmark::State& state) {
     {
         // One untimed run sizes the string: a single iteration of a large W
         // would otherwise measure the kernel faulting in fresh pages.
-        ZOA_file unit(true, K == ASM);
+        ZOA_file unit(true, K == ASM || K == SOUND_ASM, K == SOUND_ASM ? Profile::SOUND : Profile::EXACT);
         bench::buildWorkload(unit, shape);
         write<K>(unit, os);
     }
     for (auto _ : state) {
         state.PauseTiming();
-        ZOA_file unit(true, K == ASM);
+        ZOA_file unit(true, K == ASM || K == SOUND_ASM, K == SOUND_ASM ? Profile::SOUND : Profile::EXACT);
         bench::buildWorkload(unit, shape);
         sink.clear();
         state.ResumeTiming();
@@ -112,6 +113,7 @@ void shapes(benchmark::internal::Benchmark* b) {
 BENCHMARK(BM_Build)->Apply(shapes);
 BENCHMARK_TEMPLATE(BM_Output, C_GCC)->Apply(shapes);
 BENCHMARK_TEMPLATE(BM_Output, ASM)->Apply(shapes);
+BENCHMARK_TEMPLATE(BM_Output, SOUND_ASM)->Apply(shapes);
 BENCHMARK_TEMPLATE(BM_Output, ASCII)->Apply(shapes);
 BENCHMARK_TEMPLATE(BM_Output, DOT)->Apply(shapes);
 

@@ -8,11 +8,13 @@
 namespace {
 
 const char* const usage =
-    "usage: zoa-fuzz [--mode=c|asm|crash] [--seed=N] [--count=N] [--batch=N] [--levels=-O0,-O2]\n"
+    "usage: zoa-fuzz [--mode=c|asm|sound-asm|crash] [--seed=N] [--count=N] [--batch=N] [--levels=-O0,-O2]\n"
     "                [--workdir=DIR] [--shrink=N] [--profile=exact|sound]\n"
     "Generates units from seeds N.. and checks them. c and asm: interprets every\n"
     "subprogram, compiles the unit's output with gcc -m32 and compares; failing\n"
-    "seeds are written to DIR as text and shrunk. crash: odd trees through every output.\n"
+    "seeds are written to DIR as text and shrunk. sound-asm: the c mode's units\n"
+    "written by the sound assembly back end, assembled, linked and compared.\n"
+    "crash: odd trees through every output.\n"
     "Exit status: 0 no failure, 1 failures, 2 bad usage.\n";
 
 }  // namespace
@@ -65,11 +67,12 @@ int main(int argc, char** argv) {
         std::cout << n << " odd units through every output, no crash\n";
         return 0;
     }
-    if (mode != "c" && mode != "asm") {
+    if (mode != "c" && mode != "asm" && mode != "sound-asm") {
         std::cerr << "zoa-fuzz: unknown mode '" << mode << "'\n" << usage;
         return 2;
     }
     o.mode = mode == "asm" ? ZOA::fuzz::Mode::ASM : ZOA::fuzz::Mode::C;
+    o.soundAsm = mode == "sound-asm";
     o.log = &std::cerr;
     ZOA::fuzz::CampaignStats s = ZOA::fuzz::runDifferential(o);
     ZOA::fuzz::report(std::cout, o, s);

@@ -14,7 +14,8 @@
 namespace ZOA::interp {
 
 // The C type of a value: the declared types of the tree, plus what the C text
-// makes of them (an array name is a pointer to its elements, "(int*)" a pointer
+// makes of them (an array name is a pointer to its elements, or a char pointer
+// for a unit in the sound profile, "(int*)" a pointer
 // to int, a constant too large for int a long long).
 enum class CType { SCHAR, UCHAR, INT, UINT, LLONG, ULLONG, FLOAT, DOUBLE, POINTER, VOID };
 

@@ -58,6 +58,15 @@ enum class Profile { EXACT, SOUND };
 //    (function, extern and text-made data names) or ng<id>/nl<id>; data and
 //    string names are addresses ("OFFSET FLAT:sym"), static and extern data
 //    are dword values ("DWORD PTR sym"). A null POINTER constant is 0.
+//    In the sound profile the assembly comes from a back end of its own: it
+//    assembles with `as --32` as written, is position independent (links into
+//    PIE and non-PIE programs) and computes what the C means, with array
+//    names stepping by bytes. Where the tree leaves C open: a data name made
+//    from a text without values is a private one-byte object; a POINTER
+//    constant holding text is written as that operand text; a missing child
+//    reads as zero; a jump without a target and control falling off the last
+//    label stop at ud2; alloca takes its memory below the operands of the
+//    statement, which move down with the stack.
 //  - dumpDot: one Graphviz digraph per subprogram; node statistics go to the
 //    diagnostic stream. Operators beyond the classic ones are labelled
 //    with their enumerator names ("BITWISE_AND", "CONV4"), a POINTER constant

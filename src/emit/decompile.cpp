@@ -1,6 +1,7 @@
 // ZOA_file::decompile: the fixed sequence that drives one emitter over a unit.
 #include "emit/c/decompile_c.h"
 #include "emit/x86/decompile_asm.h"
+#include "emit/x86/sound/sound_x86.h"
 
 #include <zoa/zoa_file.h>
 
@@ -11,6 +12,16 @@ namespace ZOA {
 
 bool ZOA_file::decompile(std::ostream& os) {
     if (!checkCurrent()) return false;
+    if (profile == Profile::SOUND && asmMode) {
+        {
+            SoundX86 x86(os, subprogs);
+            x86.writeUnit(names, subprogs);
+        }
+        names.clear();
+        subprogs.clear();
+        callPrototypes.clear();
+        return true;
+    }
     if (profile == Profile::SOUND && !asmMode) {
         DecompileC c(os, isGcc, true);
         if (!c.writeSoundUnit(*this, getDiagnosticStream())) return false;

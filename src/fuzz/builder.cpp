@@ -118,6 +118,14 @@ ExprBase* Builder::index(unsigned count) {
     return new BINOP(INT_U, BITWISE_AND, expr(INT_U, 1), intConst(INT_U, count - 1));
 }
 
+ExprBase* Builder::tableOffset(ExprBase* idx, unsigned elemSize) {
+    if (!target.namesInBytes || elemSize == 1) return idx;
+    if (idx->getNodeType() == CONST_NODE)
+        return intConst(INT_S, static_cast<CONST*>(idx)->getIValue() * static_cast<long long>(elemSize));
+    DataType t = idx->getDataType() == INT_U ? INT_U : INT_S;
+    return new BINOP(t, MUL, idx, intConst(t, elemSize));
+}
+
 // The address of a cell of type t, or null when there is none to use.
 ExprBase* Builder::address(DataType t, bool forStore) {
     unsigned size = sizeOfType(t);
@@ -268,7 +276,7 @@ void Builder::computedJump(unsigned budget, unsigned nest) {
     LABEL* join = sp->createNewLabel(REGULAR_LABEL);
     if (chance(50)) {
         NAME* table = sp->getName(addrs);
-        add(new JUMP(new MEM(POINTER, new BINOP(POINTER, PLUS, table, index(n)))));
+        add(new JUMP(new MEM(POINTER, new BINOP(POINTER, PLUS, table, tableOffset(index(n), sizeOfType(POINTER))))));
     } else {
         TEMP* target = sp->getTemp(POINTER, 0, IN_USE_TEMP);
         add(new MOVE(target, addrs.front()));

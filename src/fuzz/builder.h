@@ -87,8 +87,8 @@ protected:
     // After every subprogram has its body.
     virtual void finish() {}
     virtual CONST* floatingConstant(DataType t);
-    // The offset of element idx of a table of elemSize-byte values from its name.
-    virtual ExprBase* tableOffset(ExprBase* idx, unsigned) { return idx; }
+    // The offset of element idx of a table name: in bytes where names step by bytes.
+    virtual ExprBase* tableOffset(ExprBase* idx, unsigned elemSize);
     virtual NAME* makeTable(const std::list<ExprBase*>& values) { return unit->getName(values); }
     // What a call through a pointer loads the function's address from.
     virtual ExprBase* functionAddress(const Fn& f) { return unit->getName(SUBPROG_REF, f.name.c_str()); }
@@ -108,6 +108,7 @@ protected:
     TEMP* varOf(DataType t, bool exact);
     ExprBase* leaf(DataType t);
     ExprBase* index(unsigned count);
+    // An index into a name's elements of `size` bytes, as the target steps through names.
     ExprBase* address(DataType t, bool forStore);
     ExprBase* scaled(ExprBase* idx, unsigned size);
     ExprBase* expr(DataType t, unsigned depth);

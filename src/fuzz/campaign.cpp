@@ -1,6 +1,7 @@
 // Runs generated units through the interpreter and through gcc, and compares.
 #include "fuzz/campaign.h"
 #include "fuzz/quiet_stdout.h"
+#include "fuzz/sound_asm.h"
 
 #include "core/type_facts.h"
 #include "emit/c/c_texts.h"
@@ -49,7 +50,7 @@ struct Prepared {
     std::string text;
     std::string c;  // the C text, or the assembly text in assembly mode
     bool assembly = false;
-    bool sound = false;
+    bool sound = false;  // in the sound profile (sound assembly: one file per unit)
     unsigned fileNames = 0;
     std::vector<Call> calls;
 };
@@ -192,14 +193,16 @@ struct BuildResult {
 BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std::string& dir,
                             const std::string& level) {
     std::string units_c, driver_c, expected;
-    bool sound = !units.empty() && units.front()->sound;
+    bool soundC = !units.empty() && units.front()->sound && !units.front()->assembly;
     // The sound text defines the types itself.
-    if (!sound) units_c = "typedef long long int64;\ntypedef unsigned long long uint64;\n";
+    if (!soundC) units_c = "typedef long long int64;\ntypedef unsigned long long uint64;\n";
     driver_c = "#include <stdio.h>\ntypedef long long int64;\ntypedef unsigned long long uint64;\n";
     std::string body;
     std::string units_s;
+    std::vector<const std::string*> soundTexts;
     for (const Prepared* p : units) {
-        if (p->assembly) appendAssemblable(units_s, p->c, p->prefix);
+        if (p->sound && p->assembly) soundTexts.push_back(&p->c);
+        else if (p->assembly) appendAssemblable(units_s, p->c, p->prefix);
         // File-level names are ng<id> in every unit: keep each unit's apart.
         for (unsigned k = 0; k < p->fileNames; ++k)
             units_c += "#define ng" + std::to_string(k) + " " + p->prefix + "ng" + std::to_string(k) + "\n";
@@ -227,16 +230,18 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
     }
     driver_c += "int main(void)\n{\n" + body + "    return 0;\n}\n";
     bool assembly = !units.empty() && units.front()->assembly;
+    bool sound = !units.empty() && units.front()->sound;
     std::string unitsFile = dir + (assembly ? "/units.s" : "/units.c");
-    writeText(unitsFile, assembly ? units_s : units_c);
+    if (sound && assembly) unitsFile = writeSoundAsmFiles(soundTexts, dir);
+    else writeText(unitsFile, assembly ? units_s : units_c);
     writeText(dir + "/driver.c", driver_c);
     BuildResult r;
     std::string out;
     std::string prog = dir + "/prog" + level;
     // The assembly is position-dependent (OFFSET FLAT:) and assumes nothing of
     // the stack's alignment at a call.
-    std::string flags = assembly ? " -no-pie -mstackrealign" : " -fno-strict-aliasing";
-    if (sound && level == "-O0" &&
+    std::string flags = assembly ? (sound ? soundAsmLinkFlags() : " -no-pie -mstackrealign") : " -fno-strict-aliasing";
+    if (sound && !assembly && level == "-O0" &&
         shell("gcc -m32 -c -std=gnu99 -Wall -Werror -Wno-unused-label -Wno-unused-variable "
               "-Wno-unused-but-set-variable -o " + dir + "/units.o " + unitsFile, &out) != 0) {
         r.detail = "not clean under -Wall -Werror: " + out.substr(0, 2000);
@@ -274,8 +279,8 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
 // Re-checks one unit given as text, for the shrinker.
 bool textFails(const std::string& text, const std::vector<Entry>& entries, const std::string& prefix,
                const std::string& dir, const std::vector<std::string>& levels, const std::string& kind,
-               Profile profile) {
-    text::Result parsed = text::parse(text, "reduced.zoa");
+               Profile profile, bool assembly) {
+    text::Result parsed = text::parse(text, "reduced.zoa", text::Flavour{true, assembly});
     if (!parsed.ok()) return false;
     // The text form does not keep private data apart: a reduced sound unit may merge it.
     parsed.unit()->setProfile(profile);
@@ -299,7 +304,7 @@ CampaignStats runDifferential(const CampaignOptions& o) {
     unsigned shrunk = 0;
     // Only the driver is compiled in assembly mode: one level is enough.
     const std::vector<std::string> levels =
-        o.mode == Mode::ASM ? std::vector<std::string>{"-O0"} : o.optLevels;
+        o.mode == Mode::ASM || o.soundAsm ? std::vector<std::string>{"-O0"} : o.optLevels;
 
     auto flush = [&]() {
         if (batch.empty()) return;
@@ -325,7 +330,8 @@ CampaignStats runDifferential(const CampaignOptions& o) {
                         std::vector<Entry> entries = batchEntries[i];
                         std::string prefix = batch[i].prefix, kind = f.kind;
                         f.reduced = shrink(f.text, [&](const std::string& t) {
-                            return textFails(t, entries, prefix, o.workDir, levels, kind, o.profile);
+                            return textFails(t, entries, prefix, o.workDir, levels, kind,
+                                             o.soundAsm ? Profile::SOUND : o.profile, o.soundAsm);
                         }, 800);
                         writeText(base + ".min.zoa", f.reduced);
                         if (o.log) *o.log << "  reduced: " << base << ".min.zoa\n";
@@ -345,8 +351,11 @@ CampaignStats runDifferential(const CampaignOptions& o) {
         Prepared p;
         p.seed = seed;
         p.prefix = "u" + std::to_string(seed) + "_";
-        Target target{true, o.mode == Mode::ASM, o.mode == Mode::C ? o.profile : Profile::EXACT};
+        // The sound assembly runs the exact C mode's units, with names stepping by bytes.
+        Target target{true, o.mode == Mode::ASM || o.soundAsm,
+                      o.mode == Mode::C && !o.soundAsm ? o.profile : Profile::EXACT, o.soundAsm};
         Generated g = generate(seed, o.mode, p.prefix, o.asmQuirks, target);
+        if (o.soundAsm) g.unit->setProfile(Profile::SOUND);
         p.text = text::write(*g.unit);
         stats.seeds++;
         stats.subprogs += static_cast<unsigned>(g.entries.size());
@@ -370,7 +379,8 @@ void report(std::ostream& os, const CampaignOptions& o, const CampaignStats& s) 
     for (const auto& [why, n] : s.dropped) dropped += n;
     os << "seeds " << o.firstSeed << ".." << (o.firstSeed + o.seeds - 1) << ": " << s.seeds << " units, "
        << s.subprogs << " subprograms, " << s.callsCompared << " calls compared";
-    if (o.mode == Mode::ASM) os << " with the assembly output";
+    if (o.soundAsm) os << " with the sound assembly";
+    else if (o.mode == Mode::ASM) os << " with the assembly output";
     else {
         if (o.profile == Profile::SOUND) os << " in the sound profile";
         os << " at each of";

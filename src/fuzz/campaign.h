@@ -28,6 +28,9 @@ struct CampaignOptions {
     // also compile on its own at -O0 with -Wall -Werror (but for unused
     // labels and variables).
     Profile profile = Profile::EXACT;
+    // With Mode::C: the units in assembly mode and the sound profile, their
+    // assembly linked with the C driver and compared with the interpreter.
+    bool soundAsm = false;
 };
 
 struct Failure {

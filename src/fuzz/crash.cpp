@@ -55,6 +55,11 @@ unsigned runCrash(std::uint64_t firstSeed, unsigned seeds, std::ostream* log) {
             QuietStdout quiet;  // the assembly output's per-subprogram note
             generate(seed, Mode::ODD, prefix, 0, Target{true, true}).unit->decompile(os);
         }
+        {  // and for the sound assembly back end
+            Generated s = generate(seed, Mode::ODD, prefix, 0, Target{true, true});
+            s.unit->setProfile(Profile::SOUND);
+            s.unit->decompile(os);
+        }
         ++done;
         if (log && (i + 1) % 500 == 0) *log << (i + 1) << " odd units\n" << std::flush;
     }

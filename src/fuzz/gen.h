@@ -55,6 +55,9 @@ struct Target {
     // constants, tables of function addresses, private mutable data and
     // alignment requests.
     Profile profile = Profile::EXACT;
+    // Array names step by bytes without the sound C constructs (the sound
+    // assembly campaign): table indexes are scaled.
+    bool namesInBytes = false;
 };
 
 // Builds the unit for `seed`; subprogram names start with `prefix`. The same

@@ -1,7 +1,7 @@
 // The simulated memory: blocks, loads and stores, string literals.
 #include "interp/memory.h"
 
-#include "emit/c/c_rules.h"
+#include "core/c_literal.h"
 
 #include <cctype>
 #include <cstdio>
@@ -59,40 +59,7 @@ void Memory::load(std::uint32_t addr, unsigned char* bytes, std::uint32_t n) {
     std::memcpy(bytes, b.data.data() + off, n);
 }
 bool Memory::literalValue(const std::string& text, std::string& value) {
-    std::string w;
-    for (std::size_t i = 0; i < text.size(); ++i) {
-        if (ctext::quoteNeedsEscape(text, i)) w += '\\';
-        w += text[i];
-    }
-    value.clear();
-    for (std::size_t i = 0; i < w.size(); ++i) {
-        char c = w[i];
-        if (c == '"') return false;  // the literal ends early
-        if (c != '\\') {
-            value += c;
-            continue;
-        }
-        if (++i >= w.size()) return false;  // the closing quote is escaped
-        c = w[i];
-        static const char from[] = "ntrabfv\\'\"?", to[] = "\n\t\r\a\b\f\v\\'\"?";
-        if (const char* p = std::strchr(from, c); p && c) {
-            value += to[p - from];
-        } else if (c >= '0' && c <= '7') {
-            int v = 0;
-            for (int k = 0; k < 3 && i < w.size() && w[i] >= '0' && w[i] <= '7'; ++k, ++i) v = v * 8 + (w[i] - '0');
-            --i;
-            value += static_cast<char>(v);
-        } else if (c == 'x') {
-            int v = 0, k = 0;
-            while (i + 1 < w.size() && std::isxdigit(static_cast<unsigned char>(w[i + 1])))
-                v = v * 16 + (std::isdigit(static_cast<unsigned char>(w[++i])) ? w[i] - '0' : (w[i] | 0x20) - 'a' + 10), ++k;
-            if (!k) return false;
-            value += static_cast<char>(v);
-        } else {
-            value += c;
-        }
-    }
-    return true;
+    return cLiteralValue(text.data(), text.size(), value);
 }
 std::uint32_t Memory::stringBlock(const std::string& text) {
     std::string s;

@@ -1,6 +1,7 @@
 // Values and C's rules for them: conversions, promotions and arithmetic on the 32-bit target.
 #include "interp/rules.h"
 
+#include "core/c_types.h"
 #include "core/op_facts.h"
 #include "emit/c/c_texts.h"
 
@@ -10,25 +11,16 @@
 
 namespace ZOA::interp {
 
+static_assert(static_cast<int>(ctypes::CT::POINTER) == static_cast<int>(CType::POINTER) &&
+                  static_cast<int>(ctypes::CT::VOID) == static_cast<int>(CType::VOID),
+              "the core's C types in the interpreter's order");
+
 void stop(Status s, const std::string& why) { throw Stop{s, why}; }
 
-unsigned bitsOf(CType t) {
-    static const unsigned w[] = {8, 8, 32, 32, 64, 64, 32, 64, 32, 0};
-    return w[static_cast<int>(t)];
-}
-int rank(CType t) {
-    static const int r[] = {0, 0, 1, 1, 2, 2, 0, 0, 0, 0};
-    return r[static_cast<int>(t)];
-}
+unsigned bitsOf(CType t) { return ctypes::bitsOf(static_cast<ctypes::CT>(t)); }
+int rank(CType t) { return ctypes::rankOf(static_cast<ctypes::CT>(t)); }
 
-std::uint64_t fit(CType t, std::uint64_t v) {
-    unsigned w = bitsOf(t);
-    if (w == 64 || w == 0) return v;
-    std::uint64_t mask = (std::uint64_t{1} << w) - 1;
-    v &= mask;
-    if (isSigned(t) && (v >> (w - 1)) & 1) v |= ~mask;
-    return v;
-}
+std::uint64_t fit(CType t, std::uint64_t v) { return ctypes::fit(static_cast<ctypes::CT>(t), v); }
 
 double roundTo(CType t, long double x) {
     return t == CType::FLOAT ? static_cast<double>(static_cast<float>(x)) : static_cast<double>(x);
@@ -45,11 +37,7 @@ std::string ctypeName(CType t) {
     return "?";
 }
 
-CType ctypeOf(DataType t) {
-    static const CType m[DATA_TYPE_COUNT] = {CType::UCHAR, CType::UINT,  CType::ULLONG, CType::SCHAR,   CType::INT,
-                                             CType::LLONG, CType::FLOAT, CType::DOUBLE, CType::POINTER, CType::VOID};
-    return static_cast<unsigned>(t) < DATA_TYPE_COUNT ? m[t] : CType::VOID;
-}
+CType ctypeOf(DataType t) { return static_cast<CType>(ctypes::ctOf(t)); }
 
 Value Value::of(CType t, std::uint64_t b) {
     Value v;
@@ -136,15 +124,7 @@ Value Rules::promote(const Value& v) {
     return v;
 }
 CType Rules::common(CType a, CType b) {
-    if (a == CType::DOUBLE || b == CType::DOUBLE) return CType::DOUBLE;
-    if (a == CType::FLOAT || b == CType::FLOAT) return CType::FLOAT;
-    if (a == b) return a;
-    if (rank(a) == rank(b)) return isSigned(a) ? b : a;  // the unsigned one
-    CType hi = rank(a) > rank(b) ? a : b;
-    CType lo = rank(a) > rank(b) ? b : a;
-    if (!isSigned(hi)) return hi;
-    if (bitsOf(hi) > bitsOf(lo)) return hi;  // the wider signed type holds every value
-    return hi == CType::LLONG ? CType::ULLONG : CType::UINT;
+    return static_cast<CType>(ctypes::common(static_cast<ctypes::CT>(a), static_cast<ctypes::CT>(b)));
 }
 bool Rules::truth(const Value& v) {
     if (v.type == CType::VOID) stop(Status::NO_MEANING, "use of a void value");

@@ -72,6 +72,18 @@ TEST(Fuzz, AssemblyCampaignAgreesWithTheInterpreter) {
     EXPECT_EQ(s.programsBuilt, 1u);
 }
 
+TEST(Fuzz, SoundAssemblyCampaignAgreesWithTheInterpreter) {
+    // The C mode's units, written by the sound back end, each in a file of its own.
+    fuzz::CampaignOptions o = campaign(fuzz::Mode::C, 1, 100);
+    o.soundAsm = true;
+    std::ostringstream log;
+    o.log = &log;
+    fuzz::CampaignStats s = fuzz::runDifferential(o);
+    EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
+    EXPECT_GT(s.callsCompared, 3 * s.seeds);
+    EXPECT_EQ(s.programsBuilt, 1u);
+}
+
 TEST(Fuzz, AssemblyModeLeavesAByteRegisterFree) {
     // Seed 104220 once made three relation values and a char move in one
     // label: every byte register held, the next load written without one.

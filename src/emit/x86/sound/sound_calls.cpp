@@ -1,0 +1,130 @@
+// SoundX86: calls with the i386 System V convention, alloca, and libgcc's 64-bit division.
+#include "emit/x86/sound/sound_x86.h"
+
+#include <cstring>
+
+namespace ZOA {
+
+using ctypes::CT;
+
+namespace {
+
+bool named(const String& s, const char* text) {
+    std::size_t n = std::strlen(text);
+    return s.size() == n && std::memcmp(s.data(), text, n) == 0;
+}
+
+}  // namespace
+
+void SoundX86::storeArgument(CT t, long long offset) {
+    switch (t) {
+    case CT::SCHAR:
+    case CT::UCHAR:  // a whole slot, extended as the value already is
+        store(CT::INT, "esp", offset);
+        return;
+    default: store(t, "esp", offset); return;
+    }
+}
+
+// Arguments are evaluated left to right, as the interpreter does, each into
+// its slot of an area reserved first, so that calls nested in arguments find
+// the stack aligned too.
+SoundX86::VT SoundX86::genCall(CALL* c) {
+    TEMP* fp = c->getFunctionPointer();
+    const String& name = c->getFunctionName();
+    if (!fp && named(name, "alloca")) return genAlloca(c);
+    SUBPROG* callee = nullptr;
+    if (!fp) {
+        auto it = subprogByName.find(std::string(name.data(), name.size()));
+        if (it != subprogByName.end()) callee = it->second;
+    }
+    // A subprogram of the unit takes its parameters' types; any other callee
+    // the arguments' own, as the call's prototype declares them.
+    std::size_t base = paramStack.size();
+    unsigned bytes = 0;
+    {
+        auto param = callee ? callee->getAllArgTemps().begin() : TempList::const_iterator();
+        for (ExprBase* a : c->getArgs()) {
+            CT t = a ? ctypes::ctOf(a->getDataType()) : CT::INT;
+            if (callee && param != callee->getAllArgTemps().end()) {
+                if (*param) t = ctypes::ctOf((*param)->getDataType());
+                ++param;
+            }
+            if (t == CT::VOID) t = CT::INT;
+            paramStack.push_back(t);
+            bytes += slotBytes(t);
+        }
+    }
+    CT ret = callee ? ctypes::ctOf(callee->getReturnType()) : ctypes::ctOf(c->getDataType());
+    unsigned pad = (16 - (depth + bytes) % 16) % 16;
+    if (pad + bytes) {
+        ins() << "sub\tesp, ";
+        sink.writeUnsigned(pad + bytes);
+        end();
+    }
+    depth += pad + bytes;
+    long long offset = 0;
+    std::size_t i = base;
+    for (ExprBase* a : c->getArgs()) {
+        CT t = paramStack[i++];
+        convert(value(a), t);
+        storeArgument(t, offset);
+        offset += slotBytes(t);
+    }
+    paramStack.resize(base);
+    if (fp) {
+        convert(genTemp(fp), CT::POINTER);
+        ins() << "call\teax\n";
+    } else if (name.empty()) {
+        ins() << "ud2\n";  // neither a name nor a pointer
+    } else {
+        ins() << "call\t" << name << "@PLT\n";
+    }
+    if (pad + bytes) drop(pad + bytes);
+    if (ret == CT::SCHAR) ins() << "movsx\teax, al\n";
+    if (ret == CT::UCHAR) ins() << "movzx\teax, al\n";
+    return VT{ret, 1};
+}
+
+// Stack memory that lives until the subprogram returns: esp goes down by the
+// size rounded to 16, and the operands already pushed move down with it.
+SoundX86::VT SoundX86::genAlloca(CALL* c) {
+    if (c->getArgs().empty()) ins() << "xor\teax, eax\n";
+    else convert(value(c->getArgs().front()), CT::UINT);
+    ins() << "add\teax, 15\n";
+    ins() << "and\teax, -16\n";
+    ins() << "sub\tesp, eax\n";
+    for (unsigned k = 0; k < depth; k += 4) {
+        ins() << "mov\tecx, DWORD PTR [esp+eax+";
+        sink.writeUnsigned(k);
+        sink << "]\n";
+        ins() << "mov\t";
+        memOperand("DWORD", "esp", k);
+        sink << ", ecx\n";
+    }
+    ins() << "lea\teax, ";
+    memOperand("DWORD", "esp", depth);
+    end();
+    return VT{CT::POINTER, 1};
+}
+
+void SoundX86::callHelper(const char* name) {
+    unsigned pad = (16 - (depth + 16) % 16) % 16;
+    ins() << "mov\tecx, DWORD PTR [esp]\n";
+    ins() << "mov\tesi, DWORD PTR [esp+4]\n";
+    if (pad) {
+        ins() << "sub\tesp, ";
+        sink.writeUnsigned(pad);
+        end();
+    }
+    ins() << "push\tesi\n";
+    ins() << "push\tecx\n";
+    ins() << "push\tedx\n";
+    ins() << "push\teax\n";
+    ins() << "call\t" << name << "@PLT\n";
+    ins() << "add\tesp, ";
+    sink.writeUnsigned(pad + 16);
+    end();
+}
+
+}  // namespace ZOA
