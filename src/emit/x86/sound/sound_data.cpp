@@ -30,33 +30,16 @@ SoundX86::CVal SoundX86::constValue(CONST* k) {
     switch (k->getDataType()) {
     case CHAR_U: v.t = CT::UCHAR; break;
     case INT_U: v.t = CT::UINT; break;
-    case INT64_U:  // written with LL: a long long, wrapped
+    // The sound C writes every constant with its own type (ULL, the most
+    // negative int as an expression, floats to the bit).
+    case INT64_U: v.t = CT::ULLONG; break;
     case INT64_S: v.t = CT::LLONG; break;
     case CHAR_S: v.t = CT::SCHAR; break;
-    case INT_S:  // -2147483648 is the negation of a long long literal
-        v.t = static_cast<std::int32_t>(i) == INT32_MIN ? CT::LLONG : CT::INT;
-        if (v.t == CT::LLONG) i = INT32_MIN;
-        break;
-    case FLOAT: {
-        // Written with six significant digits: an int literal when it shows no
-        // point, else a double literal.
-        double d = k->getFValue();
-        if (!std::isfinite(ctext::narrowToFloat(d))) {  // no C text: kept as it is
-            v.t = CT::DOUBLE;
-            v.real = d;
-            return v;
-        }
-        char buf[64];
-        ctext::formatFloatLiteral(buf, d);
-        if (!std::strpbrk(buf, ".e")) {
-            v.t = CT::INT;
-            v.bits = static_cast<std::uint64_t>(std::strtoll(buf, nullptr, 10));
-            return v;
-        }
-        v.t = CT::DOUBLE;
-        v.real = std::strtod(buf, nullptr);
+    case INT_S: v.t = CT::INT; break;
+    case FLOAT:
+        v.t = CT::FLOAT;
+        v.real = static_cast<double>(ctext::narrowToFloat(k->getFValue()));
         return v;
-    }
     case DOUBLE:
         v.t = CT::DOUBLE;
         v.real = k->getFValue();
