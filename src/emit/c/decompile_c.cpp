@@ -186,6 +186,8 @@ void DecompileC::visit(UNOP* u) {
         writeOperand(x);
         sink << ": -";
         writeOperand(x);
+    } else if (sound && u->getOp() == NOT) {
+        writeTruth(x, " == 0");
     } else {
         writeUnopText(u->getOp());
         sink << '(';
@@ -195,11 +197,26 @@ void DecompileC::visit(UNOP* u) {
     sink << ')';
 }
 
+// Sound: operands of logical operators are compared with 0, so that no number
+// stands in a boolean context (gcc warns on that even after folding, where no
+// pragma reaches).
+void DecompileC::writeTruth(ExprBase* x, const char* comparison) {
+    sink << '(';
+    writeOperand(x);
+    sink << comparison << ')';
+}
+
 void DecompileC::visit(BINOP* b) {
     sink << '(';
-    writeOperand(b->getLeft());
-    writeBinopText(b->getOp());
-    writeOperand(b->getRight());
+    if (sound && (b->getOp() == AND || b->getOp() == OR)) {
+        writeTruth(b->getLeft(), " != 0");
+        writeBinopText(b->getOp());
+        writeTruth(b->getRight(), " != 0");
+    } else {
+        writeOperand(b->getLeft());
+        writeBinopText(b->getOp());
+        writeOperand(b->getRight());
+    }
     sink << ')';
 }
 

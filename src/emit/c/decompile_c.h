@@ -73,6 +73,7 @@ public:
     void writeTypeName(DataType t);
     // Leaves, temporaries and constants bare, everything else in parentheses.
     void writeOperand(ExprBase* e);
+    void writeTruth(ExprBase* x, const char* comparison);
     // " <op> "; two blanks for a value without operator.
     void writeBinopText(BinopKind op);
     void writeUnopText(UnopKind op);
