@@ -145,7 +145,8 @@ void DecompileC::visit(NAME* n) {
         writeUnsigned(n->getId());
         return;
     case SUBPROG_REF:
-        sink << (sound ? "((char *)" : "(void *)") << n->getStringValue();
+        sink << (sound ? "((char *)" : "(void *)");
+        writeFunctionName(n->getStringValue());
         if (sound) sink << ')';
         return;
     case CONST_ARRAY_REF:

@@ -74,6 +74,11 @@ public:
     // Leaves, temporaries and constants bare, everything else in parentheses.
     void writeOperand(ExprBase* e);
     void writeTruth(ExprBase* x, const char* comparison);
+    // A function's name as the C text spells it, and the asm label that then
+    // keeps its symbol (decompile_c_sound.cpp).
+    bool spelledApart(const String& name) const;
+    void writeFunctionName(const String& name);
+    void writeAsmLabel(const String& name);
     // " <op> "; two blanks for a value without operator.
     void writeBinopText(BinopKind op);
     void writeUnopText(UnopKind op);

@@ -380,6 +380,55 @@ TEST(SoundC, DisagreeingCallsGetAVariadicDeclaration) {
     EXPECT_EQ(run(dir, sound.text, harness), "7");
 }
 
+void builtinNames(ZOA_file& u) {
+    auto define = [&](const char* name, DataType arg, auto body) {
+        SUBPROG* s = u.createSubprog(INT_S, name, false);
+        TEMP* a = s->getArgTemp(arg);
+        TEMP* b = std::string(name) == "putchar" ? s->getArgTemp(INT_S) : nullptr;
+        start(s)->addStmt(new MOVE(ret(s), body(a, b)));
+    };
+    define("abs", INT_S, [](TEMP* a, TEMP*) { return new BINOP(INT_S, PLUS, a, new CONST(100)); });
+    define("index", CHAR_S, [](TEMP* a, TEMP*) { return new BINOP(INT_S, MUL, a, new CONST(2)); });
+    define("nan", INT_S, [](TEMP* a, TEMP*) { return new BINOP(INT_S, MUL, a, a); });
+    define("putchar", INT_S, [](TEMP* a, TEMP* b) { return new BINOP(INT_S, MINUS, a, b); });
+    NAME* table = u.createData(std::list<ExprBase*>{u.getName(SUBPROG_REF, "abs")});
+    SUBPROG* f = u.createSubprog(INT_S, "f", false);
+    TEMP* p = f->getTemp(POINTER, 0, IN_USE_TEMP);
+    auto call = [](const char* name, std::vector<ExprBase*> args) { return new CALL(INT_S, name, args); };
+    ExprBase* sum = new BINOP(INT_S, PLUS, call("abs", {new CONST(-5)}), call("index", {new CONST(CHAR_S, 3)}));
+    sum = new BINOP(INT_S, PLUS, sum, call("nan", {new CONST(4)}));
+    sum = new BINOP(INT_S, PLUS, sum, call("putchar", {new CONST(10), new CONST(4)}));
+    start(f)->addStmt(new MOVE(p, new MEM(POINTER, table)));
+    start(f)->addStmt(new MOVE(ret(f), new BINOP(INT_S, PLUS, sum, new CALL(INT_S, p, std::vector<ExprBase*>{new CONST(1)}))));
+    // External functions named like built-ins, called with signatures of their own.
+    SUBPROG* g = u.createSubprog(INT_S, "g", false);
+    start(g)->addStmt(new EXP(new CALL(VOID, "bzero", std::vector<ExprBase*>{})));
+    start(g)->addStmt(new MOVE(ret(g), new BINOP(INT_S, PLUS, call("rindex", {new CONST(1)}), call("strlen", {u.getName(STRINGLIT_REF, "abc")}))));
+}
+
+// Functions named like GCC built-ins: declared without a clash, and called as
+// written at every level (gcc would fold a built-in abs(-5) to 5).
+TEST(SoundC, FunctionsNamedLikeBuiltinsKeepTheirOwnMeaning) {
+    std::string dir = scratchDir();
+    EXPECT_FALSE(compilesStrictly(dir, "typedef long long int64;\n" + emit(builtinNames, Profile::EXACT).text));
+    Emitted sound = emit(builtinNames, Profile::SOUND);
+    ASSERT_TRUE(compilesStrictly(dir, sound.text)) << sound.text;
+    EXPECT_NE(sound.text.find("int zoa_builtin_abs(int ) __asm__(\"abs\");"), std::string::npos) << sound.text;
+    EXPECT_NE(sound.text.find("int zoa_builtin_rindex(int ) __asm__(\"rindex\");"), std::string::npos);
+    EXPECT_NE(sound.text.find("unsigned int strlen(const char *);"), std::string::npos);  // the library's own
+    // The harness defines the externals under their symbols, as a library would.
+    std::string unit = writeFile(dir, "unit.c", sound.text);
+    std::string main = writeFile(dir, "main.c",
+                                 "#include <stdio.h>\nint f(void); int g(void);\n"
+                                 "int lib_rindex(int x) __asm__(\"rindex\");\nint lib_rindex(int x) { return x + 40; }\n"
+                                 "void lib_bzero(void) __asm__(\"bzero\");\nvoid lib_bzero(void) {}\n"
+                                 "int main(void) { printf(\"%d %d\", f(), g()); return 0; }\n");
+    for (const char* level : {"-O0", "-O2"})
+        EXPECT_EQ(buildAndRun32(dir, {unit, main}, level).output, "224 44") << level;
+    EXPECT_EQ(interpreted(builtinNames, "f"), "224");
+    EXPECT_EQ(emit(builtinNames, Profile::SOUND, false).text.find("zoa_builtin_"), std::string::npos);
+}
+
 // ---- names the C text cannot carry ----
 
 TEST(SoundC, UnwritableNamesAreRefusedAndReported) {
@@ -390,6 +439,8 @@ TEST(SoundC, UnwritableNamesAreRefusedAndReported) {
         {"is not a C identifier", [](ZOA_file& u) { u.createSubprog(VOID, "two words", false); }},
         {"is a C keyword", [](ZOA_file& u) { u.getName(EXTERN_DATA_REF, "int"); }},
         {"clashes with a name the C output makes", [](ZOA_file& u) { u.createSubprog(VOID, "t3", false); }},
+        {"'zoa_builtin_abs' clashes with a name the C output makes",
+         [](ZOA_file& u) { u.createSubprog(VOID, "zoa_builtin_abs", false); }},
         {"names both a function and data",
          [](ZOA_file& u) {
              u.getName(EXTERN_DATA_REF, "x");
