@@ -236,6 +236,9 @@ void DecompileC::writeArgList(CALL* c, const std::vector<DataType>* params) {
     for (ExprBase* a : c->getArgs()) {
         if (i != 0) sink << ", ";
         if (params && i < params->size()) writeSoundCast((*params)[i], a);
+        // Past the fixed part the value is the node's own, then promoted:
+        // the C type of an operator's text is the promoted one, not the node's.
+        else if (params && a) writeSoundCast(a->getDataType(), a);
         ++i;
         printFlat(a);
     }

@@ -104,7 +104,7 @@ private:
     void writeCutNote() override;
     void printLabel(LABEL* l);
     // With params (sound profile), each argument that has a parameter is
-    // converted to its type.
+    // converted to its type, each further one to its own node type.
     void writeArgList(CALL* c, const std::vector<DataType>* params = nullptr);
     void writeArgTypes(CALL* c);
     void writeDataPrefix(NAME* n);

@@ -378,6 +378,23 @@ TEST(SoundC, DisagreeingCallsGetAVariadicDeclaration) {
         "  while (n--) s += va_arg(ap, double); va_end(ap); return s; }\n"
         "void noargs() {}\ndouble f(void);\nint main(void) { printf(\"%g\", f()); return 0; }\n";
     EXPECT_EQ(run(dir, sound.text, harness), "7");
+
+    // A variadic argument has its node's type: a char sum wraps before it is
+    // promoted, though its C text alone would have type unsigned int.
+    auto charSum = [](ZOA_file& u) {
+        SUBPROG* g = u.createSubprog(INT_S, "g", false);
+        auto wrapped = new BINOP(CHAR_S, PLUS, new CONST(INT_U, 250u), new CONST(INT_U, 10u));
+        start(g)->addStmt(new MOVE(ret(g), new CALL(INT_S, "zoa_vsum", std::vector<ExprBase*>{new CONST(1), wrapped})));
+        start(g)->addStmt(new EXP(new CALL(INT_S, "zoa_vsum", std::vector<ExprBase*>{new CONST(0)})));
+    };
+    Emitted chars = emit(charSum, Profile::SOUND);
+    ASSERT_TRUE(compilesStrictly(dir, chars.text)) << chars.text;
+    const char* vsum =
+        "int zoa_vsum(int n, ...) { va_list ap; int s = 0; va_start(ap, n);\n"
+        "  while (n--) s += va_arg(ap, int); va_end(ap); return s; }\n"
+        "int g(void);\nint main(void) { printf(\"%d\", g()); return 0; }\n";
+    EXPECT_EQ(run(dir, chars.text, vsum), "4");
+    EXPECT_EQ(interpreted(charSum, "g"), "4");
 }
 
 void builtinNames(ZOA_file& u) {
