@@ -273,11 +273,9 @@ void DecompileC::declareSignature(const std::string& name, const CallSignature& 
 bool DecompileC::writeSoundUnit(ZOA_file& unit, std::ostream& diag) {
     NameCheck check(diag);
     CallSignatures sigs;
-    sigs.decide(unit, [&check](TreeBase* n) {
-        if (n->getNodeType() != CONST_NODE) return;
-        CONST* c = static_cast<CONST*>(n);
-        if (c->getDataType() == POINTER && c->getPValue()) check.fail("a POINTER constant holds C text, which means nothing here");
-    });
+    sigs.decide(unit);
+    for (std::size_t i = 0; i < sigs.textConstants().size(); ++i)
+        check.fail("a POINTER constant holds C text, which means nothing here");
     for (SUBPROG* sp : unit.getSubprogs())
         if (sp) check.function(view(sp->getName()), true);
     for (auto& entry : sigs.all())
