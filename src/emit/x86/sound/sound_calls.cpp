@@ -26,6 +26,28 @@ void SoundX86::storeArgument(CT t, long long offset) {
     }
 }
 
+// The type an argument is passed as: the declared parameter's while there
+// is one, past them C's default promotions (FLOAT as DOUBLE, chars as int),
+// as the C compiler passes them for the declaration the sound C writes.
+// A call through a pointer declares the arguments' own types.
+SoundX86::CT SoundX86::argumentType(const CallSignature* sig, std::size_t i, ExprBase* a) {
+    DataType t = a ? a->getDataType() : INT_S;
+    if (sig && i < sig->params.size() && sig->params[i] != VOID) t = sig->params[i];
+    else if (sig && t == FLOAT) t = DOUBLE;
+    CT c = ctypes::ctOf(t);
+    return c == CT::VOID || (sig && i >= sig->params.size() && ctypes::bitsOf(c) == 8) ? CT::INT : c;
+}
+
+// Zero of a type in the value registers: what a value asked of a void function is.
+void SoundX86::zeroValue(CT t) {
+    if (ctypes::isReal(t)) {
+        ins() << "fldz\n";
+        return;
+    }
+    ins() << "xor\teax, eax\n";
+    if (ctypes::is64(t)) ins() << "xor\tedx, edx\n";
+}
+
 // Arguments are evaluated left to right, as the interpreter does, each into
 // its slot of an area reserved first, so that calls nested in arguments find
 // the stack aligned too.
@@ -33,29 +55,15 @@ SoundX86::VT SoundX86::genCall(CALL* c) {
     TEMP* fp = c->getFunctionPointer();
     const String& name = c->getFunctionName();
     if (!fp && named(name, "alloca")) return genAlloca(c);
-    SUBPROG* callee = nullptr;
-    if (!fp) {
-        auto it = subprogByName.find(std::string(name.data(), name.size()));
-        if (it != subprogByName.end()) callee = it->second;
-    }
-    // A subprogram of the unit takes its parameters' types; any other callee
-    // the arguments' own, as the call's prototype declares them.
+    const CallSignature* sig = fp ? nullptr : signatures.find(std::string_view(name.data(), name.size()));
     std::size_t base = paramStack.size();
     unsigned bytes = 0;
-    {
-        auto param = callee ? callee->getAllArgTemps().begin() : TempList::const_iterator();
-        for (ExprBase* a : c->getArgs()) {
-            CT t = a ? ctypes::ctOf(a->getDataType()) : CT::INT;
-            if (callee && param != callee->getAllArgTemps().end()) {
-                if (*param) t = ctypes::ctOf((*param)->getDataType());
-                ++param;
-            }
-            if (t == CT::VOID) t = CT::INT;
-            paramStack.push_back(t);
-            bytes += slotBytes(t);
-        }
+    std::size_t i = 0;
+    for (ExprBase* a : c->getArgs()) {
+        CT t = argumentType(sig, i++, a);
+        paramStack.push_back(t);
+        bytes += slotBytes(t);
     }
-    CT ret = callee ? ctypes::ctOf(callee->getReturnType()) : ctypes::ctOf(c->getDataType());
     unsigned pad = (16 - (depth + bytes) % 16) % 16;
     if (pad + bytes) {
         ins() << "sub\tesp, ";
@@ -64,7 +72,7 @@ SoundX86::VT SoundX86::genCall(CALL* c) {
     }
     depth += pad + bytes;
     long long offset = 0;
-    std::size_t i = base;
+    i = base;
     for (ExprBase* a : c->getArgs()) {
         CT t = paramStack[i++];
         convert(value(a), t);
@@ -81,9 +89,18 @@ SoundX86::VT SoundX86::genCall(CALL* c) {
         ins() << "call\t" << name << "@PLT\n";
     }
     if (pad + bytes) drop(pad + bytes);
+    // The value is what the function really returns (a unit's subprogram or
+    // a C library function), converted to the call's type as the C casts it.
+    DataType wanted = c->getDataType();
+    DataType real = sig && (sig->library || sig->defined) ? sig->returnType : wanted;
+    CT ret = ctypes::ctOf(real);
     if (ret == CT::SCHAR) ins() << "movsx\teax, al\n";
     if (ret == CT::UCHAR) ins() << "movzx\teax, al\n";
-    return VT{ret, 1};
+    if (wanted == VOID || wanted == real) return VT{ret, 1};
+    CT to = ctypes::ctOf(wanted);
+    if (ret == CT::VOID) zeroValue(to);
+    else convert(VT{ret, 1}, to);
+    return VT{to, 1};
 }
 
 // Stack memory that lives until the subprogram returns: esp goes down by the
