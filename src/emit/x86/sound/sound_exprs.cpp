@@ -194,12 +194,7 @@ SoundX86::VT SoundX86::genName(NAME* n) {
 }
 
 SoundX86::VT SoundX86::genTemp(TEMP* t) {
-    if (t->getNodeType() == BUF_TEMP_NODE) {
-        ins() << "lea\teax, ";
-        memOperand("DWORD", "ebp", slotOf(t));
-        end();
-        return VT{CT::POINTER, 1};
-    }
+    if (t->getNodeType() == BUF_TEMP_NODE) return bufferAddress(static_cast<BUF_TEMP*>(t));
     CT c = ctypes::ctOf(t->getDataType());
     loadFrom(c, "ebp", slotOf(t));
     return VT{c, 1};
