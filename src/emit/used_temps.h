@@ -24,6 +24,22 @@ namespace ZOA {
 class UsedTemps {
 public:
     void collect(SUBPROG* sp);
+
+    // For a walker that marks as it goes (the C output marks what it
+    // prints): begin() forgets the last subprogram and marks sp's return
+    // and argument temporaries; mark() the temporaries met.
+    void begin(SUBPROG* sp);
+    void mark(TEMP* t) {
+        unsigned int id = t->getId();
+        if (id < own.size() && own[id] == t) used[id] = 1;
+        else others.assign(t, TEMP_NODE);
+    }
+    // Marks the temporaries in n's values, which collect() walks and a
+    // printer does not. `level` is the depth at which collect() would meet n
+    // or more; false when collect() could have been cut below n, so that
+    // only collect() itself gives its marks.
+    bool markValues(NAME* n, unsigned int level);
+
     bool isUsed(const TEMP* t) const {
         if (!t) return false;
         unsigned int id = t->getId();
@@ -35,11 +51,7 @@ public:
 
 private:
     void walk(TreeBase* n);
-    void mark(TEMP* t) {
-        unsigned int id = t->getId();
-        if (id < own.size() && own[id] == t) used[id] = 1;
-        else others.assign(t, TEMP_NODE);
-    }
+    bool markBelow(TreeBase* n, unsigned int level);
 
     std::vector<const TEMP*> own;     // the subprogram's temporaries by id
     std::vector<unsigned char> used;  // by id

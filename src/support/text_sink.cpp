@@ -17,12 +17,49 @@ TextSink& TextSink::writeBlanks(unsigned int n) {
 }
 
 template <class T> TextSink& TextSink::writeNumber(T v) {
-    if (depth != 0 && CAPACITY - used >= MAX_DECIMAL_CHARS) {
+    if (depth != 0 && capacity - used >= MAX_DECIMAL_CHARS) {
         used += writeDecimal(buf.get() + used, v);
         return *this;
     }
     char digits[MAX_DECIMAL_CHARS];
     return write(digits, writeDecimal(digits, v));
+}
+
+void TextSink::overflow(const char* p, std::size_t n) {
+    if (!held) {
+        flush();
+        os.write(p, static_cast<std::streamsize>(n));
+        return;
+    }
+    // What comes before the held text can go; then grow if still short.
+    if (holdStart > 0) {
+        os.write(buf.get(), static_cast<std::streamsize>(holdStart));
+        std::memmove(buf.get(), buf.get() + holdStart, used - holdStart);
+        used -= holdStart;
+        holdStart = 0;
+    }
+    if (n > capacity - used) {
+        std::size_t grown = capacity * 2;
+        while (n > grown - used) grown *= 2;
+        std::unique_ptr<char[]> bigger(new char[grown]);
+        std::memcpy(bigger.get(), buf.get(), used);
+        buf = std::move(bigger);
+        capacity = grown;
+    }
+    std::memcpy(buf.get() + used, p, n);
+    used += n;
+}
+
+void TextSink::moveToFront(std::size_t at, std::size_t tail) {
+    std::size_t n = used - tail;
+    if (n == 0 || at == tail) return;
+    if (n > scratchSize) {
+        scratch.reset(new char[n]);
+        scratchSize = n;
+    }
+    std::memcpy(scratch.get(), buf.get() + tail, n);
+    std::memmove(buf.get() + at + n, buf.get() + at, tail - at);
+    std::memcpy(buf.get() + at, scratch.get(), n);
 }
 
 template TextSink& TextSink::writeNumber(unsigned long long);

@@ -43,12 +43,11 @@ public:
     TextSink& write(const char* p, std::size_t n) {
         if (depth == 0) {
             os.write(p, static_cast<std::streamsize>(n));
-        } else if (n <= CAPACITY - used) {
+        } else if (n <= capacity - used) {
             copyShort(buf.get() + used, p, n);
             used += n;
         } else {
-            flush();
-            os.write(p, static_cast<std::streamsize>(n));
+            overflow(p, n);
         }
         return *this;
     }
@@ -56,14 +55,14 @@ public:
     TextSink& operator<<(const char* s) { return write(s, std::strlen(s)); }
     TextSink& operator<<(const String& s) { return write(s.data(), s.size()); }
     TextSink& operator<<(char c) {
-        if (depth != 0 && used < CAPACITY) buf[used++] = c;
+        if (depth != 0 && used < capacity) buf[used++] = c;
         else write(&c, 1);
         return *this;
     }
     // n levels of four blanks; the usual shallow levels inline.
     TextSink& indent(unsigned int n) {
         if (n == 0) return *this;
-        if (n <= MAX_INLINE_INDENT && depth != 0 && CAPACITY - used >= 4 * n) {
+        if (n <= MAX_INLINE_INDENT && depth != 0 && capacity - used >= 4 * n) {
             copyShort(buf.get() + used, BLANKS, 4 * n);
             used += 4 * n;
             return *this;
@@ -72,7 +71,7 @@ public:
     }
     // Plain decimal.
     TextSink& writeUnsigned(unsigned long long v) {
-        if (v < 100 && depth != 0 && CAPACITY - used >= 2) {
+        if (v < 100 && depth != 0 && capacity - used >= 2) {
             // Temporary and label ids are mostly small.
             char* p = buf.get() + used;
             if (v >= 10) *p++ = static_cast<char>('0' + v / 10);
@@ -84,25 +83,57 @@ public:
     }
     TextSink& writeInt(long long v) { return writeNumber(v); }
 
-    // Hands what is gathered to the stream.
+    // Hands what is gathered to the stream (not while a Hold keeps it).
     void flush() {
-        if (used == 0) return;
+        if (used == 0 || held) return;
         os.write(buf.get(), static_cast<std::streamsize>(used));
         used = 0;
     }
+
+    // Inside a Batch, keeps everything written from here on in memory (the
+    // buffer grows as needed) until the Hold ends, so that a piece written
+    // later can still go in front of it. Offsets count from the Hold's start.
+    class Hold {
+    public:
+        explicit Hold(TextSink& t) : t(t) {
+            t.held = true;
+            t.holdStart = t.used;
+        }
+        ~Hold() { t.held = false; }
+        Hold(const Hold&) = delete;
+        Hold& operator=(const Hold&) = delete;
+        // Bytes held so far.
+        std::size_t length() const { return t.used - t.holdStart; }
+        // Drops what was held after the first `len` bytes.
+        void truncate(std::size_t len) { t.used = t.holdStart + len; }
+        // Moves the text from offset `tail` to the end in front of the text
+        // from offset `at` (at <= tail).
+        void moveToFront(std::size_t at, std::size_t tail) { t.moveToFront(t.holdStart + at, t.holdStart + tail); }
+
+    private:
+        TextSink& t;
+    };
 
 private:
     TextSink& writeBlanks(unsigned int n);
     // For unsigned long long and long long (text_sink.cpp).
     template <class T> TextSink& writeNumber(T v);
+    // A piece that does not fit: flushed around, or the buffer grows under a Hold.
+    void overflow(const char* p, std::size_t n);
+    void moveToFront(std::size_t at, std::size_t tail);
 
     static constexpr std::size_t CAPACITY = 1 << 15;
     static constexpr unsigned int MAX_INLINE_INDENT = 4;
     static constexpr char BLANKS[4 * MAX_INLINE_INDENT + 1] = "                ";
     std::ostream& os;
     std::size_t used = 0;
+    std::size_t capacity = CAPACITY;
     unsigned int depth = 0;
-    std::unique_ptr<char[]> buf{new char[CAPACITY]};  // one allocation per sink
+    bool held = false;
+    std::size_t holdStart = 0;
+    std::unique_ptr<char[]> buf{new char[CAPACITY]};  // one allocation per sink, unless a Hold grows it
+    std::unique_ptr<char[]> scratch;                  // moveToFront's copy of the tail
+    std::size_t scratchSize = 0;
 };
 
 }  // namespace ZOA

@@ -14,7 +14,10 @@ namespace ZOA {
 DecompileC::DecompileC(std::ostream& os, bool isGcc, bool sound) : DecompileBase(os, isGcc), sound(sound), sink(os) {}
 DecompileC::~DecompileC() {}
 
-void DecompileC::writeCutNote() { sink << "/* " << CUT_NOTE << " */"; }
+void DecompileC::writeCutNote() {
+    unmarked = true;  // the whole walk may cut elsewhere
+    sink << "/* " << CUT_NOTE << " */";
+}
 
 void DecompileC::writeInt(long long v) { sink.writeInt(v); }
 
@@ -40,6 +43,7 @@ void DecompileC::printExpr(ExprBase* e, NodeType t) {
     switch (t) {
     case TEMP_NODE:
     case BUF_TEMP_NODE:
+        usedTemps.mark(static_cast<TEMP*>(e));
         sink << 't';
         writeUnsigned(static_cast<TEMP*>(e)->getId());
         return;
@@ -81,11 +85,13 @@ void DecompileC::writeDataPrefix(NAME* n) {
 }
 
 void DecompileC::visit(TEMP* t) {
+    usedTemps.mark(t);
     pad(indentLevel) << 't';
     writeUnsigned(t->getId());
 }
 
 void DecompileC::visit(BUF_TEMP* t) {
+    usedTemps.mark(t);
     pad(indentLevel) << 't';
     writeUnsigned(t->getId());
 }
@@ -139,6 +145,7 @@ void DecompileC::visit(CONST* c) {
 }
 
 void DecompileC::visit(NAME* n) {
+    if (marking && !n->getList().empty()) valueNames.emplace_back(n, nesting.level());
     switch (n->getKind()) {
     case LABEL_REF:
         sink << "&&LAB";

@@ -9,6 +9,7 @@
 #include <zoa/enums.h>
 
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace ZOA {
@@ -97,6 +98,9 @@ private:
     void printStmt(StmtBase* s);
     void writeCutNote() override;
     void printLabel(LABEL* l);
+    // The labels in trace order.
+    void printBody();
+    void declareLocals(SUBPROG* sp);
     // With params (sound profile), each argument that has a parameter is
     // converted to its type.
     void writeArgList(CALL* c, const std::vector<DataType>* params = nullptr);
@@ -126,6 +130,12 @@ private:
     bool sound;
     const CallSignatures* signatures = nullptr;  // sound profile, set by writeSoundUnit
     UsedTemps usedTemps;  // reused across subprograms
+    // While a body is printed (see visit(SUBPROG)): the temporaries printed
+    // are marked; the names with values met, with their depth; set when the
+    // marks may miss what a whole walk finds.
+    bool marking = false;
+    bool unmarked = false;
+    std::vector<std::pair<NAME*, unsigned int>> valueNames;
     TextSink sink;     // everything this emitter writes goes through it
 };
 

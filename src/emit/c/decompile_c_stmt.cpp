@@ -196,8 +196,7 @@ void DecompileC::visit(SUBPROG* sp) {
     writeTypeName(sp->getReturnType());
     sink << sp->getName() << '(';
 
-    usedTemps.collect(sp);
-
+    usedTemps.begin(sp);
     bool first = true;
     for (TEMP* t : sp->getAllArgTemps()) {
         if (!first) sink << ", ";
@@ -207,7 +206,37 @@ void DecompileC::visit(SUBPROG* sp) {
     sink << ")\n{\n";
     ++indentLevel;
 
-    // Locals: the used, non-argument temporaries in allTemps order, buffers first.
+    // One walk: the body is printed first, held in the sink, and marks the
+    // temporaries it prints; the locals then go in front of it. Where the
+    // printed body may not reach what the whole-subprogram walk reaches (a
+    // cut, a label of another subprogram, values of a name too deep), that
+    // walk decides and the body is printed again.
+    {
+        TextSink::Hold hold(sink);
+        buildTraces();
+        marking = true;
+        unmarked = false;
+        valueNames.clear();
+        printBody();
+        marking = false;
+        for (const auto& entry : valueNames)
+            if (!usedTemps.markValues(entry.first, entry.second)) unmarked = true;
+        std::size_t body = hold.length();
+        if (unmarked) {
+            hold.truncate(0);
+            usedTemps.collect(sp);
+        }
+        declareLocals(sp);
+        if (unmarked) printBody();
+        else hold.moveToFront(0, body);
+    }
+    sink << "\n}\n\n";
+    --indentLevel;
+}
+
+// Locals: the used, non-argument temporaries in allTemps order, buffers
+// first; then the local data.
+void DecompileC::declareLocals(SUBPROG* sp) {
     for (int pass = 0; pass < 2; ++pass) {
         bool buffers = pass == 0;
         for (TEMP* t : sp->getAllTemps()) {
@@ -216,12 +245,28 @@ void DecompileC::visit(SUBPROG* sp) {
         }
     }
     for (NAME* n : sp->getAllLocalNames()) defineName(n);
+}
 
-    buildTraces();
-    for (LABEL* l : traceOrder) printLabel(l);
-
-    sink << "\n}\n\n";
-    --indentLevel;
+void DecompileC::printBody() {
+    if (!marking) {
+        for (LABEL* l : traceOrder) printLabel(l);
+        return;
+    }
+    // The whole walk goes through exactly this subprogram's labels: a label
+    // of another one (pulled by a jump) is printed here but not walked, and
+    // one placed while another subprogram was printed is walked but not
+    // printed here.
+    const auto& own = curSubprog->getAllLabels();
+    std::size_t ownPrinted = 0;
+    for (LABEL* l : traceOrder) {
+        auto it = own.find(l->getId());
+        if (it != own.end() && it->second == l) ++ownPrinted;
+        else unmarked = true;
+        printLabel(l);
+    }
+    std::size_t ownLabels = 0;
+    for (const auto& entry : own) ownLabels += entry.second != nullptr;
+    if (ownPrinted != ownLabels) unmarked = true;
 }
 
 void DecompileC::printLabel(LABEL* l) {

@@ -80,6 +80,29 @@ TEST(TextSink, EveryLengthCopiedExactlyAcrossTheBufferEnd) {
     EXPECT_EQ(os.str(), expected);
 }
 
+// A Hold keeps what follows it in memory however long it grows, while what
+// came before may go out; a later piece moves in front of the held text.
+TEST(TextSink, HoldGrowsPastTheBufferAndMovesATailToItsFront) {
+    std::ostringstream os;
+    std::string prefix(20000, 'p'), body, tail = "TAIL";
+    for (int i = 0; i < 30000; ++i) body += std::to_string(i % 97) + ' ';
+    {
+        TextSink t(os);
+        TextSink::Batch batch(t);
+        t << prefix;
+        TextSink::Hold hold(t);
+        t << "junk";
+        hold.truncate(0);
+        for (int i = 0; i < 30000; ++i) t.writeUnsigned(static_cast<unsigned long long>(i % 97)) << ' ';
+        EXPECT_EQ(hold.length(), body.size());
+        std::size_t end = hold.length();
+        t << tail;
+        hold.moveToFront(0, end);
+        EXPECT_LT(os.str().size(), prefix.size() + 1);  // only the prefix may be out yet
+    }
+    EXPECT_EQ(os.str(), prefix + tail + body);
+}
+
 TEST(Decimal, MatchesPrintfAroundEveryBoundary) {
     char buf[MAX_DECIMAL_CHARS];
     std::vector<unsigned long long> values = {0, 9, 10, 99999999, 100000000, 100000001, 18446744073709551615ull};
