@@ -50,13 +50,31 @@ void SoundX86::zeroValue(CT t) {
 
 // Arguments are evaluated left to right, as the interpreter does, each into
 // its slot of an area reserved first, so that calls nested in arguments find
-// the stack aligned too.
+// the stack aligned too. Only the argument loop is here: calls nested as deep
+// as the walks go keep this frame small.
 SoundX86::VT SoundX86::genCall(CALL* c) {
-    TEMP* fp = c->getFunctionPointer();
+    if (!c->getFunctionPointer() && named(c->getFunctionName(), "alloca")) return genAlloca(c);
+    const CallSignature* sig = signatureOf(c);
+    unsigned area = reserveArguments(c, sig);
+    std::size_t i = paramStack.size() - c->getArgs().size();
+    long long offset = 0;
+    for (ExprBase* a : c->getArgs()) {
+        CT t = paramStack[i++];
+        convert(value(a), t);
+        storeArgument(t, offset);
+        offset += slotBytes(t);
+    }
+    return makeCall(c, sig, area);
+}
+
+const CallSignature* SoundX86::signatureOf(CALL* c) const {
     const String& name = c->getFunctionName();
-    if (!fp && named(name, "alloca")) return genAlloca(c);
-    const CallSignature* sig = fp ? nullptr : signatures.find(std::string_view(name.data(), name.size()));
-    std::size_t base = paramStack.size();
+    return c->getFunctionPointer() ? nullptr : signatures.find(std::string_view(name.data(), name.size()));
+}
+
+// The arguments' types onto paramStack and their area, padded so that esp is
+// 16-byte aligned at the call; the bytes reserved.
+unsigned SoundX86::reserveArguments(CALL* c, const CallSignature* sig) {
     unsigned bytes = 0;
     std::size_t i = 0;
     for (ExprBase* a : c->getArgs()) {
@@ -71,16 +89,13 @@ SoundX86::VT SoundX86::genCall(CALL* c) {
         end();
     }
     depth += pad + bytes;
-    long long offset = 0;
-    i = base;
-    for (ExprBase* a : c->getArgs()) {
-        CT t = paramStack[i++];
-        convert(value(a), t);
-        storeArgument(t, offset);
-        offset += slotBytes(t);
-    }
-    paramStack.resize(base);
-    if (fp) {
+    return pad + bytes;
+}
+
+SoundX86::VT SoundX86::makeCall(CALL* c, const CallSignature* sig, unsigned area) {
+    paramStack.resize(paramStack.size() - c->getArgs().size());
+    const String& name = c->getFunctionName();
+    if (TEMP* fp = c->getFunctionPointer()) {
         convert(genTemp(fp), CT::POINTER);
         ins() << "call\teax\n";
     } else if (name.empty()) {
@@ -88,7 +103,7 @@ SoundX86::VT SoundX86::genCall(CALL* c) {
     } else {
         ins() << "call\t" << name << "@PLT\n";
     }
-    if (pad + bytes) drop(pad + bytes);
+    drop(area);
     // The value is what the function really returns (a unit's subprogram or
     // a C library function), converted to the call's type as the C casts it.
     DataType wanted = c->getDataType();

@@ -100,6 +100,7 @@ private:
     VT genTemp(TEMP* t);
     VT genMem(MEM* m);
     VT genUnop(UNOP* u);
+    VT genAbs(ExprBase* x);
     VT genBinop(BinopKind op, ExprBase* l, ExprBase* r);
     VT genArith(BinopKind op, VT l, VT r);
     bool genDirect(BinopKind op, VT l, ExprBase* r, VT& result);
@@ -124,6 +125,9 @@ private:
 
     // ---- calls (sound_calls.cpp)
     VT genCall(CALL* c);
+    const CallSignature* signatureOf(CALL* c) const;  // null for a call through a pointer
+    unsigned reserveArguments(CALL* c, const CallSignature* sig);
+    VT makeCall(CALL* c, const CallSignature* sig, unsigned area);
     VT genAlloca(CALL* c);
     void callHelper(const char* name);  // libgcc's 64-bit division: left in edx:eax, right at [esp]
     void storeArgument(CT t, long long offset);
