@@ -40,6 +40,7 @@ void DecompileASM::declareCallPrototype(CALL*) {}
 void DecompileASM::visit(SUBPROG* sp) {
     line() << ".intel_syntax noprefix";
     endLine();
+    endEntry();
     // Kept word for word on purpose: existing clients look for this note.
     *notes << "FIXME: implement dumpAllStaticData" << std::endl;
     line() << ".text";
@@ -102,6 +103,7 @@ void DecompileASM::visit(SUBPROG* sp) {
     --indentLevel;
     endLine();
     endLine();
+    endEntry();
 }
 
 void DecompileASM::writeEpilogue() {

@@ -144,6 +144,14 @@ public:
     void storeToAddress(MEM* mem, AsmRegister v);
 
 protected:
+    // Lines gather in the sink; each entry point hands them to the stream
+    // (endEntry), so text written to the stream between entry points (and
+    // the note, which may go to the same stream) stays in order.
+    void endLine() { sink << '\n'; }
+    void endEntry() {
+        sink.flush();
+        out.flush();
+    }
     unsigned int maxOutgoingArgBytes = 0;
     ExprBase* regHolders[HOLDER_SLOTS];
     std::uint32_t heldSlots = 0;  // bit i set while regHolders[i] is not null
@@ -154,6 +162,8 @@ private:
         std::string_view prefix;  // size keyword
         std::string_view text;    // register, memory or immediate text
     };
+    // defineName without handing the lines to the stream.
+    void writeData(NAME* n);
     static std::string_view sizePrefixText(ExprBase* e);
     OperandParts operandParts(ExprBase* e, bool useRegister, bool byteForm);
     void evict(ExprBase* holder);
@@ -169,11 +179,6 @@ private:
     // followed by a flush of the stream, as std::endl would: whoever reads the
     // stream sees every line as soon as it is complete.
     TextSink& line() { return sink.indent(indentLevel); }
-    void endLine() {
-        sink << '\n';
-        sink.flush();
-        out.flush();
-    }
     void put(const char* s) { sink << s; }
     void putUnsigned(unsigned long long v) { sink.writeUnsigned(v); }
     void putInt(long long v) { sink.writeInt(v); }

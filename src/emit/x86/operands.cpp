@@ -234,6 +234,11 @@ void DecompileASM::visit(TEMP* t) {
 // Writes the data of one file-level name; see the class comment for the
 // symbols and for names without values.
 void DecompileASM::defineName(NAME* n) {
+    writeData(n);
+    endEntry();
+}
+
+void DecompileASM::writeData(NAME* n) {
     if (!n) return;
     ExprAnnotation* a = ensureAnnotation(n);
     const String& text = a->memText;

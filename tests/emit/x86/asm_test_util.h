@@ -38,10 +38,23 @@ private:
 // The emitter with its protected state opened up for the tests.
 class TestASM : public DecompileASM {
 public:
-    explicit TestASM(std::ostream& os) : DecompileASM(os, true) {}
+    explicit TestASM(std::ostringstream& os) : DecompileASM(os, true), os(os) {}
+    // What was written so far, the gathered lines included.
+    std::string text() {
+        endEntry();
+        return os.str();
+    }
+    // Forgets what was written so far.
+    void clear() {
+        endEntry();
+        os.str("");
+    }
     void setIndent(unsigned int n) { indentLevel = n; }
     void setSubprog(SUBPROG* sp) { curSubprog = sp; }
     ExprBase* holder(unsigned int i) const { return regHolders[i]; }
+
+private:
+    std::ostringstream& os;
 };
 
 inline std::string decompileAsm(ZOA_file& unit, std::string* console = nullptr) {

@@ -23,7 +23,7 @@ TEST(AsmExamples, DataTableAndNameKinds) {
     std::ostringstream os;
     TestASM e(os);
     e.defineName(tab);
-    EXPECT_EQ(os.str(),
+    EXPECT_EQ(e.text(),
               ".section .data\n.align 4\n.type tab,@object\n.size tab,12\ntab:\n"
               ".int 1\n.int 2\n.int 3\n\n");
 
@@ -68,7 +68,7 @@ TEST(AsmExamples, OperandTexts) {
     EXPECT_EQ(text(t), "BYTE PTR t0[ebp]");
     EXPECT_EQ(e.operandText(nullptr, true), "");
     EXPECT_EQ(DecompileASM::valueSize(new BUF_TEMP(9, 10)), 10u);
-    EXPECT_EQ(os.str(), "");  // leaves write nothing
+    EXPECT_EQ(e.text(), "");  // leaves write nothing
 }
 
 // Emits one BINOP of two operands made by `make` (a in t1, b in t2) with the
@@ -84,7 +84,7 @@ std::string binopLines(std::function<BINOP*(TEMP*, TEMP*)> make, DataType argTyp
     BINOP* op = make(a, b);
     e.visit(op);
     *reg = regOf(op);
-    return os.str();
+    return e.text();
 }
 
 TEST(AsmExamples, BinopRows) {
@@ -126,7 +126,7 @@ TEST(AsmExamples, AddressOperations) {
     TestASM e(os);
     MEM* m = new MEM(INT_S, new BINOP(POINTER, MINUS, p, new CONST(8)));
     (new MOVE(v, m))->accept(&e);
-    EXPECT_EQ(os.str(), "mov eax, DWORD PTR t0[ebp]\nmov eax, [eax - 8]\nmov DWORD PTR t1[ebp], eax\n");
+    EXPECT_EQ(e.text(), "mov eax, DWORD PTR t0[ebp]\nmov eax, [eax - 8]\nmov DWORD PTR t1[ebp], eax\n");
 }
 
 TEST(AsmExamples, ConditionalJump) {
@@ -140,7 +140,7 @@ TEST(AsmExamples, ConditionalJump) {
     TestASM e(os);
     e.setIndent(1);
     e.visit(c);
-    EXPECT_EQ(os.str(), "    mov eax, DWORD PTR t1[ebp]\n    cmp DWORD PTR eax, 10\n    jl .La2\n    jmp .La3\n");
+    EXPECT_EQ(e.text(), "    mov eax, DWORD PTR t1[ebp]\n    cmp DWORD PTR eax, 10\n    jl .La2\n    jmp .La3\n");
 
     // Placed right after the current label: the false branch falls through.
     sp->getStartLabel()->addStmt(c);
@@ -163,10 +163,10 @@ TEST(AsmExamples, Moves) {
     TestASM e(os);
     e.setIndent(1);
     auto lines = [&](StmtBase* s) {
-        os.str("");
+        e.clear();
         e.resetRegisters();
         s->accept(&e);
-        return os.str();
+        return e.text();
     };
     EXPECT_EQ(lines(new MOVE(t1, t2)), "    mov eax, DWORD PTR t2[ebp]\n    mov DWORD PTR t1[ebp], eax\n");
     EXPECT_EQ(regOf(t1), EAX);

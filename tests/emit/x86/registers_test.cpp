@@ -73,16 +73,16 @@ TEST(AsmRegisters, ExhaustedDwordsYieldNoRegister) {
         e.visit(t[i]);
         e.loadIntoRegister(t[i], false);
     }
-    os.str("");
+    e.clear();
     e.visit(t[4]);
     EXPECT_EQ(e.loadIntoRegister(t[4], false), NO_REGISTER);
-    EXPECT_EQ(os.str(), "mov , DWORD PTR t4[ebp]\n");
+    EXPECT_EQ(e.text(), "mov , DWORD PTR t4[ebp]\n");
     EXPECT_EQ(e.allocateByte(), NO_REGISTER);
 
     // Already in a register: resized and, when claimed, dropped from the holders.
-    os.str("");
+    e.clear();
     EXPECT_EQ(e.loadIntoRegister(t[1], true), EBX);
-    EXPECT_EQ(os.str(), "");
+    EXPECT_EQ(e.text(), "");
     EXPECT_EQ(regOf(t[1]), NO_REGISTER);
     EXPECT_TRUE(e.isReserved(EBX));
 }
