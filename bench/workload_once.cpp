@@ -1,12 +1,15 @@
 // Builds workload W once and writes one output, for instruction counts under valgrind.
 #include "workload.h"
 
+#include <zoa/text.h>
+#include <zoa/verify.h>
+
 #include <cstdlib>
 #include <cstring>
 #include <iostream>
 #include <sstream>
 
-// usage: zoa_workload_once build|c|asm|sound-asm|ascii|dot [F B S] [--print]
+// usage: zoa_workload_once build|c|asm|sound-asm|ascii|dot|text|verify [F B S] [--print]
 // (--print writes the output on standard output, e.g. to assemble and time it)
 int main(int argc, char** argv) {
     using namespace ZOA;
@@ -22,6 +25,8 @@ int main(int argc, char** argv) {
     if (!std::strcmp(mode, "c") || !std::strcmp(mode, "asm") || sound) unit.decompile(os);
     else if (!std::strcmp(mode, "ascii")) unit.dumpAscii(os);
     else if (!std::strcmp(mode, "dot")) unit.dumpDot(os);
+    else if (!std::strcmp(mode, "text")) text::write(os, unit);
+    else if (!std::strcmp(mode, "verify")) os << verify::verify(unit).size();
     std::cout.rdbuf(saved);
     if (print) std::cout << os.str();
     std::cerr << mode << ": " << os.tellp() << " bytes, " << shape.totalStatements() << " statements\n";

@@ -75,6 +75,22 @@ inline double roundTo(CT t, long double x) {
     return static_cast<double>(static_cast<float>(x));
 }
 
+// A constant as the sound C text writes it: with its own type (ULL, the most
+// negative int as an expression, floats to the bit), so the integer bits are
+// cut to that type and a FLOAT is rounded to float. POINTER and VOID
+// constants have no value here (bits and real 0).
+struct Constant {
+    CT type;
+    std::uint64_t bits = 0;
+    double real = 0;
+};
+inline Constant soundConstant(DataType t, long long i, double f) {
+    CT ct = ctOf(t);
+    if (isReal(ct)) return {ct, 0, roundTo(ct, f)};
+    if (isInt(ct)) return {ct, fit(ct, static_cast<std::uint64_t>(i)), 0};
+    return {ct, 0, 0};
+}
+
 }  // namespace ZOA::ctypes
 
 #endif

@@ -28,14 +28,10 @@ template <class Key> std::uint32_t Machine::Impl::addressIn(CodeMap<Key>& m, con
 // ---- expressions
 Value Machine::Impl::constant(CONST* k) {
     long long i = k->getIValue();
-    if (sound) {
-        switch (k->getDataType()) {
-            case INT64_U: return Value::of(CType::ULLONG, static_cast<std::uint64_t>(i));
-            case INT_S: return Value::of(CType::INT, static_cast<std::uint64_t>(i));
-            case FLOAT: return Value::floating(FLOAT, static_cast<double>(ctext::narrowToFloat(k->getFValue())));
-            case DOUBLE: return Value::floating(DOUBLE, k->getFValue());
-            default: break;
-        }
+    if (sound && k->getDataType() != POINTER) {
+        ctypes::Constant c = ctypes::soundConstant(k->getDataType(), i, k->getFValue());
+        if (c.type == ctypes::CT::FLOAT || c.type == ctypes::CT::DOUBLE) return Value::floating(k->getDataType(), c.real);
+        if (c.type != ctypes::CT::VOID) return Value::of(static_cast<CType>(c.type), c.bits);
     }
     switch (k->getDataType()) {
         case CHAR_U: return Value::of(CType::UCHAR, static_cast<std::uint64_t>(i));

@@ -2,6 +2,8 @@
 #ifndef ZOA_INTERP_RULES_H
 #define ZOA_INTERP_RULES_H
 
+#include "core/c_types.h"
+
 #include <zoa/interp.h>
 
 #include <cstdint>
@@ -19,9 +21,10 @@ struct Stop {
 
 [[noreturn]] void stop(Status s, const std::string& why);
 
-inline bool isInt(CType t) { return t <= CType::ULLONG; }
-inline bool isReal(CType t) { return t == CType::FLOAT || t == CType::DOUBLE; }
-inline bool isSigned(CType t) { return t == CType::SCHAR || t == CType::INT || t == CType::LLONG; }
+// CType is ctypes::CT (core/c_types.h) under its public name.
+inline bool isInt(CType t) { return ctypes::isInt(static_cast<ctypes::CT>(t)); }
+inline bool isReal(CType t) { return ctypes::isReal(static_cast<ctypes::CT>(t)); }
+inline bool isSigned(CType t) { return ctypes::isSigned(static_cast<ctypes::CT>(t)); }
 unsigned bitsOf(CType t);
 // Integer conversion rank: char 0, int 1, long long 2.
 int rank(CType t);

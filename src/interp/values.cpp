@@ -22,9 +22,7 @@ int rank(CType t) { return ctypes::rankOf(static_cast<ctypes::CT>(t)); }
 
 std::uint64_t fit(CType t, std::uint64_t v) { return ctypes::fit(static_cast<ctypes::CT>(t), v); }
 
-double roundTo(CType t, long double x) {
-    return t == CType::FLOAT ? static_cast<double>(static_cast<float>(x)) : static_cast<double>(x);
-}
+double roundTo(CType t, long double x) { return ctypes::roundTo(static_cast<ctypes::CT>(t), x); }
 
 std::string ctypeName(CType t) {
     // The C emitter's spelling of the declared type that has this C type.

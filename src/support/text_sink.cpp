@@ -28,12 +28,12 @@ template <class T> TextSink& TextSink::writeNumber(T v) {
 void TextSink::overflow(const char* p, std::size_t n) {
     if (!held) {
         flush();
-        os.write(p, static_cast<std::streamsize>(n));
+        put(p, n);
         return;
     }
     // What comes before the held text can go; then grow if still short.
     if (holdStart > 0) {
-        os.write(buf.get(), static_cast<std::streamsize>(holdStart));
+        put(buf.get(), holdStart);
         std::memmove(buf.get(), buf.get() + holdStart, used - holdStart);
         used -= holdStart;
         holdStart = 0;

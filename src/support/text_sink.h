@@ -10,11 +10,12 @@
 #include <cstring>
 #include <memory>
 #include <ostream>
+#include <string>
 #include <string_view>
 
 namespace ZOA {
 
-// Outside a Batch every piece goes straight to the stream (ostream::write), so
+// Outside a Batch every piece goes straight to the stream (or string) (ostream::write), so
 // a caller writing to the same stream between two pieces keeps its place.
 // Inside a Batch the pieces are appended to the buffer and written with one
 // ostream::write per buffer-full and at the end of the outermost Batch: the
@@ -22,7 +23,9 @@ namespace ZOA {
 // are formatted here (plain decimal), never with the stream's flags.
 class TextSink {
 public:
-    explicit TextSink(std::ostream& os) : os(os) {}
+    explicit TextSink(std::ostream& os) : os(&os) {}
+    // Appends to a string instead of a stream.
+    explicit TextSink(std::string& into) : str(&into) {}
     ~TextSink() { flush(); }
     TextSink(const TextSink&) = delete;
     TextSink& operator=(const TextSink&) = delete;
@@ -42,7 +45,7 @@ public:
 
     TextSink& write(const char* p, std::size_t n) {
         if (depth == 0) {
-            os.write(p, static_cast<std::streamsize>(n));
+            put(p, n);
         } else if (n <= capacity - used) {
             copyShort(buf.get() + used, p, n);
             used += n;
@@ -86,7 +89,7 @@ public:
     // Hands what is gathered to the stream (not while a Hold keeps it).
     void flush() {
         if (used == 0 || held) return;
-        os.write(buf.get(), static_cast<std::streamsize>(used));
+        put(buf.get(), used);
         used = 0;
     }
 
@@ -115,6 +118,10 @@ public:
     };
 
 private:
+    void put(const char* p, std::size_t n) {
+        if (str) str->append(p, n);
+        else os->write(p, static_cast<std::streamsize>(n));
+    }
     TextSink& writeBlanks(unsigned int n);
     // For unsigned long long and long long (text_sink.cpp).
     template <class T> TextSink& writeNumber(T v);
@@ -125,7 +132,8 @@ private:
     static constexpr std::size_t CAPACITY = 1 << 15;
     static constexpr unsigned int MAX_INLINE_INDENT = 4;
     static constexpr char BLANKS[4 * MAX_INLINE_INDENT + 1] = "                ";
-    std::ostream& os;
+    std::ostream* os = nullptr;
+    std::string* str = nullptr;
     std::size_t used = 0;
     std::size_t capacity = CAPACITY;
     unsigned int depth = 0;

@@ -1,13 +1,13 @@
-// The text writer's output: a buffer handed to the stream in large pieces, node heads, quoted texts.
+// The text writer's output: node heads, spellings, numbers and quoted texts on a TextSink.
 #ifndef ZOA_TEXT_WRITE_BUFFER_H
 #define ZOA_TEXT_WRITE_BUFFER_H
 
 #include "core/node_kinds.h"
+#include "support/text_sink.h"
 #include "text/names.h"
 
 #include <zoa/enums.h>
 
-#include <charconv>
 #include <cstdio>
 #include <ostream>
 #include <string>
@@ -22,20 +22,17 @@ struct Head {
 };
 inline Head head(NodeType k) { return {k}; }
 
-// The text gathered in a buffer and handed to the stream a large piece at a
-// time, or appended straight to a string; numbers in plain decimal, whatever
-// the stream's flags.
+// The text form's pieces on top of the outputs' TextSink (one Batch for the
+// writer's lifetime): node heads, spellings and numbers in plain decimal.
 class Out {
 public:
-    explicit Out(std::ostream& os) : os(&os), buf(local) { local.reserve(CAPACITY + 64); }
-    explicit Out(std::string& into) : buf(into) {}
-    ~Out() { flush(); }
+    explicit Out(std::ostream& os) : sink(os) {}
+    explicit Out(std::string& into) : sink(into) {}
     Out(const Out&) = delete;
     Out& operator=(const Out&) = delete;
 
     Out& operator<<(std::string_view s) {
-        buf.append(s.data(), s.size());
-        if (os && buf.size() >= CAPACITY) flush();
+        sink << s;
         return *this;
     }
     Out& operator<<(const char* s) { return *this << std::string_view(s); }
@@ -43,26 +40,19 @@ public:
     Out& operator<<(Head h) { return *this << '(' << nodeKindName(h.kind) << ' '; }
     Out& operator<<(const Spelling& s) { return s.name.empty() ? *this << s.number : *this << s.name; }
     Out& operator<<(char c) {
-        buf.push_back(c);
+        sink << c;
         return *this;
     }
     template <class T, std::enable_if_t<std::is_integral_v<T> && !std::is_same_v<T, char> && !std::is_same_v<T, bool>, int> = 0>
     Out& operator<<(T v) {
-        char tmp[24];
-        auto r = std::to_chars(tmp, tmp + sizeof tmp, v);
-        return *this << std::string_view(tmp, static_cast<std::size_t>(r.ptr - tmp));
-    }
-    void flush() {
-        if (!os) return;
-        os->write(buf.data(), static_cast<std::streamsize>(buf.size()));
-        buf.clear();
+        if constexpr (std::is_signed_v<T>) sink.writeInt(v);
+        else sink.writeUnsigned(v);
+        return *this;
     }
 
 private:
-    static constexpr std::size_t CAPACITY = 32 * 1024;
-    std::ostream* os = nullptr;
-    std::string local;
-    std::string& buf;
+    TextSink sink;
+    TextSink::Batch batch{sink};
 };
 
 inline void writeText(Out& os, const char* s, std::size_t n) {

@@ -25,31 +25,11 @@ unsigned alignmentOf(DataType t) {
 }  // namespace
 
 SoundX86::CVal SoundX86::constValue(CONST* k) {
+    ctypes::Constant c = ctypes::soundConstant(k->getDataType(), k->getIValue(), k->getFValue());
     CVal v;
-    long long i = k->getIValue();
-    switch (k->getDataType()) {
-    case CHAR_U: v.t = CT::UCHAR; break;
-    case INT_U: v.t = CT::UINT; break;
-    // The sound C writes every constant with its own type (ULL, the most
-    // negative int as an expression, floats to the bit).
-    case INT64_U: v.t = CT::ULLONG; break;
-    case INT64_S: v.t = CT::LLONG; break;
-    case CHAR_S: v.t = CT::SCHAR; break;
-    case INT_S: v.t = CT::INT; break;
-    case FLOAT:
-        v.t = CT::FLOAT;
-        v.real = static_cast<double>(ctext::narrowToFloat(k->getFValue()));
-        return v;
-    case DOUBLE:
-        v.t = CT::DOUBLE;
-        v.real = k->getFValue();
-        return v;
-    case POINTER:
-        v.t = CT::POINTER;
-        return v;
-    default: return v;
-    }
-    v.bits = ctypes::fit(v.t, static_cast<std::uint64_t>(i));
+    v.t = c.type;
+    v.bits = c.bits;
+    v.real = c.real;
     return v;
 }
 
