@@ -2,7 +2,7 @@
 #ifndef ZOA_EMIT_CALL_SIGNATURES_H
 #define ZOA_EMIT_CALL_SIGNATURES_H
 
-#include "emit/used_nodes.h"
+#include "emit/used_temps.h"
 
 #include <zoa/enums.h>
 

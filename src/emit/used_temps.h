@@ -2,7 +2,7 @@
 #ifndef ZOA_EMIT_USED_TEMPS_H
 #define ZOA_EMIT_USED_TEMPS_H
 
-#include "emit/used_nodes.h"
+#include "support/pointer_table.h"
 
 #include <zoa/expr.h>
 #include <zoa/nesting.h>
@@ -12,13 +12,15 @@
 
 namespace ZOA {
 
-// Reaches the same nodes as UsedNodes (labels, statements, the return
-// temporary, the argument temporaries), so isUsed(t) is true exactly when
-// UsedNodes would record t as TEMP_NODE (both stop at MAX_WALK_DEPTH levels,
-// so a cycle ends the walk). It walks with forEachChild (one virtual call per
-// node instead of accept and visit) and marks the
-// subprogram's own temporaries in a vector indexed by id; any other temporary
-// that turns up (another subprogram's, or a copy sharing an id) goes to a map.
+// Node identity to NodeType; keeps its capacity across clear(), so a walker
+// that reuses one map does no heap allocation per node.
+using UsedMap = PointerMap<TreeBase*, NodeType>;
+
+// Walks a subprogram's labels and statements (forEachChild, stopping
+// MAX_WALK_DEPTH levels down, so a cycle ends the walk); the return and
+// argument temporaries count as used. The subprogram's own temporaries are
+// marked in a vector indexed by id; any other temporary that turns up
+// (another subprogram's, or a copy sharing an id) goes to a map.
 // The buffers keep their capacity, so one collector reused across
 // subprograms allocates nothing per node.
 class UsedTemps {

@@ -156,7 +156,13 @@ template <class F> void Writer::scan(TreeBase* root, F&& f) {
         }
         top.entered = true;
         path.push_back(t);
-        auto push = [this](TreeBase* c) { todo.push_back(Frame{c, false}); };
+        // Leaves are met at once: they hold nothing and cannot repeat.
+        auto push = [this, &f](TreeBase* c) {
+            NodeType k = c->getNodeType();
+            if (k == CONST_NODE) return;
+            if (k == TEMP_NODE || k == BUF_TEMP_NODE) f(c);
+            else todo.push_back(Frame{c, false});
+        };
         switch (t->getNodeType()) {
             case NAME_NODE: {
                 NAME* n = static_cast<NAME*>(t);
