@@ -86,7 +86,9 @@ struct Result {
 
 // One machine for one unit: static data keeps its contents from one call to
 // the next, as it does in the compiled program. Host functions: malloc, alloca,
-// free, strlen, puts, abs. Label and subprogram addresses are distinct values
+// free, strlen, puts, abs, and zoa_vsum(int n, ...), the wrapping int sum of
+// its n further arguments (each an int or a promoted char; the differential
+// campaigns' driver defines it in C). Label and subprogram addresses are distinct values
 // outside the data blocks. The unit must outlive the machine and must not be
 // decompiled before the runs (decompile forgets the subprograms). Never throws
 // on a bad tree: every problem comes back as a status.

@@ -98,7 +98,7 @@ enum class Profile { EXACT, SOUND };
 //    contents; returns false): a subprogram, called function or function or
 //    data name text that is not a C identifier, is a C keyword or is spelled
 //    like a name the output makes (t<n>, LAB<n>, ng<n>, nl<n>, int64,
-//    uint64); a text naming both a function and data, or data of two kinds;
+//    uint64, zoa_builtin_*); a text naming both a function and data, or data of two kinds;
 //    two subprograms of one name; a call with no name and no pointer; a POINTER
 //    constant holding C text; a call C cannot make as the tree says (another
 //    argument count than a unit or C library function takes, or an external
@@ -116,7 +116,15 @@ enum class Profile { EXACT, SOUND };
 //    expressions (MSVC; a NaN's sign and payload are not kept); string texts
 //    are decoded like C escapes (core/string_text.h) and written back with
 //    octal escapes; a discarded value is cast to void; a value asked of a void
-//    function is 0. GCC flavour only: a static subprogram is declared unused,
+//    function is 0; the operands of AND, OR and NOT are compared with 0, so no
+//    number stands where C wants a truth value. GCC flavour only: a subprogram
+//    or external function named like a GCC built-in (index, nan, abs, ...;
+//    not the C library functions called as their headers declare them) is
+//    spelled zoa_builtin_<name> in the text and keeps its own symbol through
+//    an asm label (`int zoa_builtin_abs(int ) __asm__("abs");`), so GCC
+//    neither refuses its declaration nor folds its calls as the built-in's at
+//    any level (the label assumes ELF symbols, without a leading underscore;
+//    the MSVC text keeps the name); a static subprogram is declared unused,
 //    and pragmas switch off the style warnings that valid machine-made
 //    expressions draw (-Wtautological-compare, -Wbool-compare,
 //    -Wint-in-bool-context, -Wbool-operation, -Wshift-overflow, -Wshift-count-overflow and

@@ -123,9 +123,10 @@ void CallSignatures::add(CALL* c) {
     if (!fits(it->second, c)) misfitCalls.push_back(c);
 }
 
-void CallSignatures::decide(ZOA_file& unit, const std::function<void(TreeBase*)>& each) {
+void CallSignatures::decide(ZOA_file& unit) {
     signatures.clear();
     misfitCalls.clear();
+    textPointers.clear();
     seen.clear();
     for (SUBPROG* sp : unit.getSubprogs()) {
         if (!sp) continue;
@@ -137,18 +138,33 @@ void CallSignatures::decide(ZOA_file& unit, const std::function<void(TreeBase*)>
     }
     std::vector<TreeBase*> todo;
     std::vector<TreeBase*> kids;
+    // Leaves are met as children: temporaries hold nothing, and only a
+    // constant holding text needs remembering (once).
+    auto child = [this, &kids](TreeBase* k) {
+        NodeType t = k->getNodeType();
+        if (t == TEMP_NODE || t == BUF_TEMP_NODE) return;
+        if (t == CONST_NODE) {
+            CONST* c = static_cast<CONST*>(k);
+            if (c->getDataType() == POINTER && c->getPValue() && !seen.contains(c)) {
+                seen.assign(c, CONST_NODE);
+                textPointers.push_back(c);
+            }
+            return;
+        }
+        kids.push_back(k);
+    };
     for (SUBPROG* sp : unit.getSubprogs()) {
         if (sp) todo.push_back(sp);
         while (!todo.empty()) {
             TreeBase* n = todo.back();
             todo.pop_back();
             if (seen.contains(n)) continue;
-            seen.assign(n, n->getNodeType());
-            if (each) each(n);
-            if (n->getNodeType() == CALL_NODE) add(static_cast<CALL*>(n));
+            NodeType t = n->getNodeType();
+            seen.assign(n, t);
+            if (t == CALL_NODE) add(static_cast<CALL*>(n));
             // Children go on the stack in reverse, so calls are met in walk order.
             kids.clear();
-            forEachChild(n, [&kids](TreeBase* k) { kids.push_back(k); });
+            forEachChild(n, t, child);
             todo.insert(todo.end(), kids.rbegin(), kids.rend());
         }
     }

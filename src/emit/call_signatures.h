@@ -6,7 +6,6 @@
 
 #include <zoa/enums.h>
 
-#include <functional>
 #include <map>
 #include <string>
 #include <string_view>
@@ -66,8 +65,7 @@ public:
     // Every subprogram of the unit, the callee of every named call of its
     // subprograms and registered prototypes, and every C library function a
     // SUBPROG_REF name prototype refers to.
-    // `each`, when given, sees every node of the subprograms once.
-    void decide(ZOA_file& unit, const std::function<void(TreeBase*)>& each = {});
+    void decide(ZOA_file& unit);
     void clear() { signatures.clear(); }
 
     const CallSignature* find(std::string_view name) const;
@@ -81,11 +79,14 @@ public:
     // The calls that do not fit their function's signature, in walk order.
     const std::vector<CALL*>& misfits() const { return misfitCalls; }
     static const LibraryFunction* libraryFunction(std::string_view name);
+    // The POINTER constants holding C text met by decide(), once each, in walk order.
+    const std::vector<CONST*>& textConstants() const { return textPointers; }
 
 private:
     void add(CALL* c);
     std::map<std::string, CallSignature, std::less<>> signatures;
     std::vector<CALL*> misfitCalls;
+    std::vector<CONST*> textPointers;
     UsedMap seen;  // reused across units
 };
 

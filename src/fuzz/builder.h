@@ -121,7 +121,7 @@ protected:
     void assign();
     void store();
     void callOne();
-    void hostCall();
+    virtual void hostCall();
     void ifElse(unsigned budget, unsigned nest);
     void loop(unsigned budget, unsigned nest);
     void computedJump(unsigned budget, unsigned nest);

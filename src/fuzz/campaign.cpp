@@ -196,7 +196,12 @@ BuildResult buildAndCompare(const std::vector<const Prepared*>& units, const std
     bool soundC = !units.empty() && units.front()->sound && !units.front()->assembly;
     // The sound text defines the types itself.
     if (!soundC) units_c = "typedef long long int64;\ntypedef unsigned long long uint64;\n";
-    driver_c = "#include <stdio.h>\ntypedef long long int64;\ntypedef unsigned long long uint64;\n";
+    driver_c = "#include <stdio.h>\n#include <stdarg.h>\ntypedef long long int64;\ntypedef unsigned long long uint64;\n";
+    // The variadic host function the sound units call (the interpreter models it).
+    if (!units.empty() && units.front()->sound)
+        driver_c += std::string("int ") + VARIADIC_HOST +
+                    "(int n, ...)\n{\n    va_list ap;\n    unsigned s = 0;\n    va_start(ap, n);\n"
+                    "    while (n-- > 0) s += (unsigned)va_arg(ap, int);\n    va_end(ap);\n    return (int)s;\n}\n";
     std::string body;
     std::string units_s;
     std::vector<const std::string*> soundTexts;

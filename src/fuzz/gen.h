@@ -33,6 +33,11 @@ enum AsmQuirk : unsigned {
     SCALED_INDEX = 128, // a MUL scaling the index in a buffer's address sum
 };
 
+// A host function taking any number of arguments, which the interpreter
+// models and the campaign driver defines: int zoa_vsum(int n, ...), the
+// wrapping sum of its n further int (or promoted char) arguments.
+constexpr const char* VARIADIC_HOST = "zoa_vsum";
+
 // A subprogram the driver calls, with the argument sets to call it on.
 struct Entry {
     std::string name;
@@ -52,8 +57,8 @@ struct Target {
     bool asmMode = false;
     // In the sound profile the C mode also draws what only that profile's C
     // means: byte offsets on table names, inexact and non-finite floating
-    // constants, tables of function addresses, private mutable data and
-    // alignment requests.
+    // constants, tables of function addresses, private mutable data,
+    // alignment requests and calls of VARIADIC_HOST with varying arities.
     Profile profile = Profile::EXACT;
     // Array names step by bytes without the sound C constructs (the sound
     // assembly campaign): table indexes are scaled.

@@ -1,6 +1,7 @@
 // The sound profile's additions to the C mode's grammar.
 #include "fuzz/gen_sound.h"
 
+#include <algorithm>
 #include <limits>
 
 namespace ZOA::fuzz {
@@ -35,6 +36,27 @@ ExprBase* SoundCBuilder::functionAddress(const Fn& f) {
     ExprBase* fn = CBuilder::functionAddress(f);
     if (chance(50)) return fn;
     return new MEM(POINTER, unit->createData(std::list<ExprBase*>{fn}));
+}
+
+// The variadic host function with 1 to 4 further arguments, the first a call
+// of it with none: calls of one name that disagree on their arity. Every unit
+// then declares it alike, int zoa_vsum(int, ...), as the driver defines it,
+// so units can share one file.
+void SoundCBuilder::hostCall() {
+    if (chance(50)) return CBuilder::hostCall();
+    static const DataType promoted[] = {INT_S, INT_S, CHAR_S, CHAR_U};
+    unsigned n = 1 + below(4);
+    std::vector<ExprBase*> args{intConst(INT_S, n), new CALL(INT_S, VARIADIC_HOST, std::vector<ExprBase*>{intConst(INT_S, 0)})};
+    for (unsigned i = 1; i < n; ++i) {
+        DataType t = pick(promoted);
+        ExprBase* a = expr(t, 2);
+        args.push_back(a->getDataType() == t ? a : constant(t));  // read back as an int
+    }
+    CALL* c = new CALL(INT_S, VARIADIC_HOST, args);
+    unit->addFunctionPrototype(c);
+    TEMP* v = varOf(INT_S, true);
+    if (v && std::count(vars.begin(), vars.end(), v)) add(new MOVE(v, c));
+    else add(new EXP(c));
 }
 
 void SoundCBuilder::finish() {

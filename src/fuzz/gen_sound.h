@@ -15,6 +15,7 @@ protected:
     ExprBase* tableOffset(ExprBase* idx, unsigned elemSize) override;
     NAME* makeTable(const std::list<ExprBase*>& values) override;
     ExprBase* functionAddress(const Fn& f) override;
+    void hostCall() override;
     void finish() override;
 };
 

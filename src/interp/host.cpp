@@ -1,4 +1,4 @@
-// The host functions a unit may call: malloc, alloca, free, strlen, puts and abs.
+// The host functions a unit may call: malloc, alloca, free, strlen, puts, abs and zoa_vsum.
 #include "interp/machine.h"
 
 #include <ostream>
@@ -43,6 +43,21 @@ Value Machine::Impl::host(const std::string& name, const std::vector<Value>& arg
         need(1);
         Value x = convert(args[0], CType::INT);
         return convert(intResult(CType::INT, x.bits & 0x80000000u ? -wide(x) : wide(x)), rt);
+    }
+    if (name == "zoa_vsum") {
+        // int zoa_vsum(int n, ...): the n further arguments, each read back as
+        // the int C's promotions make of it, summed with wrap-around.
+        if (args.empty()) stop(Status::NO_MEANING, name + " without its count");
+        Value n = convert(args[0], CType::INT);
+        if (static_cast<long long>(n.bits) != static_cast<long long>(args.size() - 1))
+            stop(Status::NO_MEANING, name + " with a count other than its arguments");
+        std::uint32_t sum = 0;
+        for (std::size_t i = 1; i < args.size(); ++i) {
+            if (!isInt(args[i].type) || bitsOf(args[i].type) > 32)
+                stop(Status::NO_MEANING, name + " with an argument of type " + ctypeName(args[i].type) + ", not read back as an int");
+            sum += static_cast<std::uint32_t>(convert(args[i], CType::INT).bits);
+        }
+        return convert(Value::of(CType::INT, sum), rt);
     }
     stop(Status::UNKNOWN_FUNCTION, "call of unknown function " + name);
 }

@@ -36,7 +36,9 @@ Ref parseRef(std::string_view text) {
     return r;
 }
 
-// (name ID KIND "text") | (name ID (CONST ...)) | (name ID (values EXPR...)), then flags.
+// (name ID KIND "text") | (name ID (CONST ...)) | (name ID (values EXPR...)) |
+// (name ID (data EXPR...)) | (name ID (static-data (CONST ...))) | (name ID (zero-data BYTES)),
+// then the flags local and (align N).
 NAME* Builder::nameDef(const SNode& form, std::size_t at, int ctx, bool local) {
     const SNode& def = item(form, at, "a definition");
     NAME* nm = nullptr;
@@ -50,6 +52,19 @@ NAME* Builder::nameDef(const SNode& form, std::size_t at, int ctx, bool local) {
         std::list<ExprBase*> values;
         for (std::size_t i = 1; i < def.items.size(); ++i) values.push_back(expr(def.items[i], ctx));
         nm = local ? sp->getName(values) : unit->getName(values);
+    } else if (h == "data") {
+        std::list<ExprBase*> values;
+        for (std::size_t i = 1; i < def.items.size(); ++i) values.push_back(expr(def.items[i], ctx));
+        nm = local ? sp->createData(values) : unit->createData(values);
+    } else if (h == "static-data") {
+        arity(def, 1, 1);
+        if (head(def.items[1]) != "CONST") error(def.items[1], "expected a (CONST ...), found '" + quote(def.items[1]) + "'");
+        CONST* c = constant(def.items[1]);
+        nm = local ? sp->createData(c) : unit->createData(c);
+    } else if (h == "zero-data") {
+        arity(def, 1, 1);
+        unsigned int bytes = unsignedValue(def.items[1], "a size in bytes");
+        nm = local ? sp->createZeroData(bytes) : unit->createZeroData(bytes);
     } else {
         NameKind k = enumerator(def, lookupNameKind, 7, "name kind");
         const SNode& t = item(form, next++, "a text");
@@ -58,7 +73,13 @@ NAME* Builder::nameDef(const SNode& form, std::size_t at, int ctx, bool local) {
         nm = local ? sp->getName(k, s.c_str()) : unit->getName(k, s.c_str());
     }
     for (; next < form.items.size(); ++next) {
-        if (!isSymbol(form.items[next], "local")) error(form.items[next], "unknown flag '" + quote(form.items[next]) + "'");
+        const SNode& flag = form.items[next];
+        if (head(flag) == "align") {
+            arity(flag, 1, 1);
+            nm->setAlignment(unsignedValue(flag.items[1], "an alignment in bytes"));
+            continue;
+        }
+        if (!isSymbol(flag, "local")) error(flag, "unknown flag '" + quote(flag) + "'");
         nm->setDeclaredLocal();
     }
     return nm;
@@ -104,12 +125,19 @@ void Builder::subItem(const SNode& n, SubScope& s) {
         TEMP* tmp = arg ? sp->getArgTemp(t) : sp->getTemp(t, 0, want == AVAILABLE_TEMP ? IN_USE_TEMP : want);
         record(id, tmp, want);
     } else if (h == "buffer") {
-        arity(n, 2, 3);
+        // (buffer tN SIZE [STATE] [(align N)])
+        const SNode* align = n.items.size() > 3 && head(n.items[n.items.size() - 1]) == "align" ? &n.items[n.items.size() - 1] : nullptr;
+        arity(n, align ? 3 : 2, align ? 4 : 3);
         unsigned int id = tempId(n.items[1]);
         unsigned int size = unsignedValue(n.items[2], "a buffer size");
         if (size == 0) error(n.items[2], "a buffer temporary needs a size above 0");
-        TempState want = stateAt(3, IN_USE_TEMP);
-        record(id, sp->getTemp(POINTER, size, want == AVAILABLE_TEMP ? IN_USE_TEMP : want), want);
+        TempState want = n.items.size() > (align ? 4u : 3u) ? stateAt(3, IN_USE_TEMP) : IN_USE_TEMP;
+        TEMP* buf = sp->getTemp(POINTER, size, want == AVAILABLE_TEMP ? IN_USE_TEMP : want);
+        if (align) {
+            arity(*align, 1, 1);
+            static_cast<BUF_TEMP*>(buf)->setAlignment(unsignedValue(align->items[1], "an alignment in bytes"));
+        }
+        record(id, buf, want);
     } else if (h == "label" || h == "dead") {
         arity(n, 1, 2);
         Ref r = ref(n.items[1]);

@@ -128,6 +128,7 @@ private:
     void stmt(StmtBase* s, int ctx, int depth);
     void stmtBody(StmtBase* s, int ctx, int depth);
     void nameDef(NAME* n, int ctx);
+    void privateData(NAME* n, int ctx);
     void subprog(std::size_t i);
     void global(NAME* n);
 
@@ -412,7 +413,9 @@ void Writer::stmtBody(StmtBase* s, int ctx, int depth) {
 void Writer::nameDef(NAME* n, int ctx) {
     const ExprList& l = n->getList();
     const String& text = n->getStringValue();
-    if (n->getKind() == STATIC_DATA_REF && l.size() == 1 && l.front() && text.empty() &&
+    if (n->isPrivateData()) {
+        privateData(n, ctx);
+    } else if (n->getKind() == STATIC_DATA_REF && l.size() == 1 && l.front() && text.empty() &&
         l.front()->getNodeType() == CONST_NODE && l.front()->getDataType() == n->getDataType()) {
         constant(static_cast<CONST*>(l.front()));
     } else if (n->getKind() == CONST_ARRAY_REF && text.empty()) {
@@ -425,6 +428,26 @@ void Writer::nameDef(NAME* n, int ctx) {
     } else {
         os << spell(n->getKind()) << ' ';
         writeText(os, text.data(), text.size());
+    }
+    if (n->getAlignment()) os << " (align " << n->getAlignment() << ')';
+}
+
+// Data made by createData or createZeroData.
+void Writer::privateData(NAME* n, int ctx) {
+    const ExprList& l = n->getList();
+    if (n->getKind() == STATIC_DATA_REF && l.size() == 1 && l.front() && l.front()->getNodeType() == CONST_NODE) {
+        os << "(static-data ";
+        constant(static_cast<CONST*>(l.front()));
+        os << ')';
+    } else if (n->getZeroBytes()) {
+        os << "(zero-data " << n->getZeroBytes() << ')';
+    } else {
+        os << "(data";
+        for (ExprBase* e : l) {
+            os << ' ';
+            expr(e, ctx);
+        }
+        os << ')';
     }
 }
 
@@ -452,6 +475,7 @@ void Writer::subprog(std::size_t i) {
         } else if (t->getNodeType() == BUF_TEMP_NODE) {
             os << "    (buffer t" << t->getId() << ' ' << static_cast<BUF_TEMP*>(t)->getArraySize();
             if (t->getState() != IN_USE_TEMP) os << ' ' << spell(t->getState());
+            if (unsigned int a = static_cast<BUF_TEMP*>(t)->getAlignment()) os << " (align " << a << ')';
             os << ")\n";
         } else {
             bool arg = std::find(args.begin(), args.end(), t) != args.end();

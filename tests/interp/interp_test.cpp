@@ -137,6 +137,22 @@ TEST(Interp, ControlFlowCallsAndLimits) {
     EXPECT_EQ(run(unit, "nothere"), "error: unknown function");
 }
 
+// The variadic host function: each further argument read back as the int C's
+// promotions make of it, summed with wrap-around; a count that lies stops.
+TEST(Interp, VariadicHostFunctionSumsPromotedArguments) {
+    auto vsum = [](const std::string& args) {
+        return run(expr("INT_S", "(arg t1 CHAR_S) (arg t2 CHAR_U)", "(CALL INT_S \"zoa_vsum\" " + args + ")"), "f", {-3, 200});
+    };
+    EXPECT_EQ(vsum("(CONST 0)"), "0");
+    EXPECT_EQ(vsum("(CONST 2) t1 t2"), "197");
+    EXPECT_EQ(vsum("(CONST 2) (CONST 2147483647) (CONST 1)"), "-2147483648");
+    EXPECT_EQ(vsum("(CONST 2) (CALL INT_S \"zoa_vsum\" (CONST 1) t2) t2"), "400");
+    EXPECT_EQ(vsum("(CONST 2) t1"), "error: no meaning");
+    EXPECT_EQ(vsum(""), "error: no meaning");
+    EXPECT_EQ(vsum("(CONST 1) (CONST INT64_S 5)"), "error: no meaning");
+    EXPECT_EQ(vsum("(CONST 1) (CONST DOUBLE 5.0)"), "error: no meaning");
+}
+
 // Trace building keeps its own stack: a long chain of jumps that each pull the
 // next label, and deeply nested sequences, neither exhaust the host's stack.
 TEST(Interp, LongJumpChainsAndDeepSequencesStopCleanly) {

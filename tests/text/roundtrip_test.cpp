@@ -240,6 +240,64 @@ TEST(TextRoundTrip, PoolStatesAndPrototypesAreRebuilt) {
     EXPECT_GT(txt.find("(name g1"), txt.find("(subprog s1"));
 }
 
+// Private, zero-filled and aligned data, and aligned buffers: each keeps its
+// kind (never merged into a plain name on reading) and its alignment.
+void buildPrivate(ZOA_file& u) {
+    auto words = [] { return std::list<ExprBase*>{new CONST(INT_U, 1u), new CONST(INT_U, 2u)}; };
+    u.createData(words())->setAlignment(16);
+    u.createData(new CONST(7));
+    u.createZeroData(12)->setAlignment(50);  // rounded up to 64
+    u.createData(std::list<ExprBase*>{});
+    u.getName(words())->setAlignment(8);  // the same values, but shared data
+    NAME* text = u.getName(STRINGLIT_REF, "s");
+    SUBPROG* f = u.createSubprog(INT_U, "f", false);
+    NAME* table = f->createData(std::list<ExprBase*>{text});
+    NAME* zeros = f->createZeroData(4);
+    auto* a = static_cast<BUF_TEMP*>(f->getTemp(POINTER, 20, PERMANENT_TEMP));
+    a->setAlignment(8);
+    static_cast<BUF_TEMP*>(f->getTemp(POINTER, 8, IN_USE_TEMP))->setAlignment(32);
+    f->getStartLabel()->addStmt(new MOVE(new MEM(INT_U, zeros), new UNOP(INT_U, CONV17, new MEM(POINTER, table))));
+    f->getStartLabel()->addStmt(new MOVE(f->getReturnTemp(), new UNOP(INT_U, CONV17, a)));
+}
+
+TEST(TextRoundTrip, PrivateZeroAndAlignedDataKeepTheirKind) {
+    ZOA_file exact(true, false);
+    buildPrivate(exact);
+    std::string txt = text::write(exact);
+    for (const char* want : {"(name g0 (data (CONST INT_U 1) (CONST INT_U 2)) (align 16))",
+                             "(name g1 (static-data (CONST INT_S 7)))", "(name g2 (zero-data 12) (align 64))",
+                             "(name g3 (data))", "(name g4 (values (CONST INT_U 1) (CONST INT_U 2)) (align 8))",
+                             "(name n0 (data g5))", "(name n1 (zero-data 4))", "(buffer t1 20 PERMANENT_TEMP (align 8))",
+                             "(buffer t2 8 (align 32))"})
+        EXPECT_NE(txt.find(want), std::string::npos) << want << " in\n" << txt;
+    expectRoundTrip(exact);
+
+    // The sound C of the rebuilt unit is the same as the original's.
+    ZOA_file sound(true, false, Profile::SOUND);
+    buildPrivate(sound);
+    std::string soundText = text::write(sound);
+    std::ostringstream a, b;
+    sound.decompile(a);
+    text::Result r = text::parse(soundText, "private.zoa");
+    ASSERT_TRUE(r.ok()) << text::format(r.diagnostics().at(0));
+    const auto& names = r.unit()->getNames();
+    ASSERT_EQ(names.size(), 6u);
+    EXPECT_TRUE(names.front()->isPrivateData());
+    EXPECT_FALSE(names.back()->isPrivateData());
+    r.unit()->setProfile(Profile::SOUND);
+    r.unit()->decompile(b);
+    EXPECT_EQ(a.str(), b.str());
+    EXPECT_NE(a.str().find("static __attribute__((aligned(64))) char ng2[12];"), std::string::npos) << a.str();
+
+    // Malformed forms are diagnosed, never built half.
+    for (const char* bad : {"(name g0 (zero-data))", "(name g0 (zero-data -1))", "(name g0 (static-data 5))",
+                            "(name g0 (data) (align x))", "(name g0 (data) (align))",
+                            "(subprog s0 \"f\" VOID (buffer t1 8 (align 4) IN_USE_TEMP))"}) {
+        text::Result e = text::parse(std::string("(unit gcc ") + bad + ")", "bad.zoa");
+        EXPECT_FALSE(e.ok()) << bad;
+    }
+}
+
 TEST(TextRoundTrip, ShorthandConstantsAndSharedSubtrees) {
     text::Result r = text::parse(R"((unit gcc (subprog s0 "f" INT_S
       (block L0 (MOVE t0 (CONST 5)) (MOVE t0 (CONST -2.5)) (EXP (CONST "hi"))))))", "c.zoa");

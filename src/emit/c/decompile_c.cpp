@@ -152,7 +152,8 @@ void DecompileC::visit(NAME* n) {
         writeUnsigned(n->getId());
         return;
     case SUBPROG_REF:
-        sink << (sound ? "((char *)" : "(void *)") << n->getStringValue();
+        sink << (sound ? "((char *)" : "(void *)");
+        writeFunctionName(n->getStringValue());
         if (sound) sink << ')';
         return;
     case CONST_ARRAY_REF:
@@ -193,6 +194,8 @@ void DecompileC::visit(UNOP* u) {
         writeOperand(x);
         sink << ": -";
         writeOperand(x);
+    } else if (sound && u->getOp() == NOT) {
+        writeTruth(x, " == 0");
     } else {
         writeUnopText(u->getOp());
         sink << '(';
@@ -202,11 +205,26 @@ void DecompileC::visit(UNOP* u) {
     sink << ')';
 }
 
+// Sound: operands of logical operators are compared with 0, so that no number
+// stands in a boolean context (gcc warns on that even after folding, where no
+// pragma reaches).
+void DecompileC::writeTruth(ExprBase* x, const char* comparison) {
+    sink << '(';
+    writeOperand(x);
+    sink << comparison << ')';
+}
+
 void DecompileC::visit(BINOP* b) {
     sink << '(';
-    writeOperand(b->getLeft());
-    writeBinopText(b->getOp());
-    writeOperand(b->getRight());
+    if (sound && (b->getOp() == AND || b->getOp() == OR)) {
+        writeTruth(b->getLeft(), " != 0");
+        writeBinopText(b->getOp());
+        writeTruth(b->getRight(), " != 0");
+    } else {
+        writeOperand(b->getLeft());
+        writeBinopText(b->getOp());
+        writeOperand(b->getRight());
+    }
     sink << ')';
 }
 
@@ -225,6 +243,9 @@ void DecompileC::writeArgList(CALL* c, const std::vector<DataType>* params) {
     for (ExprBase* a : c->getArgs()) {
         if (i != 0) sink << ", ";
         if (params && i < params->size()) writeSoundCast((*params)[i], a);
+        // Past the fixed part the value is the node's own, then promoted:
+        // the C type of an operator's text is the promoted one, not the node's.
+        else if (params && a) writeSoundCast(a->getDataType(), a);
         ++i;
         printFlat(a);
     }

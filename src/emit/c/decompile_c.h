@@ -74,6 +74,12 @@ public:
     void writeTypeName(DataType t);
     // Leaves, temporaries and constants bare, everything else in parentheses.
     void writeOperand(ExprBase* e);
+    void writeTruth(ExprBase* x, const char* comparison);
+    // A function's name as the C text spells it, and the asm label that then
+    // keeps its symbol (decompile_c_sound.cpp).
+    bool spelledApart(const String& name) const;
+    void writeFunctionName(const String& name);
+    void writeAsmLabel(const String& name);
     // " <op> "; two blanks for a value without operator.
     void writeBinopText(BinopKind op);
     void writeUnopText(UnopKind op);
@@ -102,7 +108,7 @@ private:
     void printBody();
     void declareLocals(SUBPROG* sp);
     // With params (sound profile), each argument that has a parameter is
-    // converted to its type.
+    // converted to its type, each further one to its own node type.
     void writeArgList(CALL* c, const std::vector<DataType>* params = nullptr);
     void writeArgTypes(CALL* c);
     void writeDataPrefix(NAME* n);

@@ -4,6 +4,7 @@
 #include "core/identifiers.h"
 #include "emit/c/c_rules.h"
 #include "emit/c/c_texts.h"
+#include "emit/c/gcc_builtins.h"
 #include "emit/call_signatures.h"
 
 #include <zoa/expr.h>
@@ -24,9 +25,13 @@ namespace {
 
 std::string_view view(const String& s) { return std::string_view(s.data(), s.size()); }
 
+// The C-side prefix of a function named like a GCC built-in.
+constexpr std::string_view BUILTIN_SPELLING = "zoa_builtin_";
+
 // Texts the C output itself defines: a name spelled like one would clash.
 bool isGeneratedName(std::string_view s) {
     if (s == "int64" || s == "uint64" || s == "ZOA_INT64_TYPES") return true;
+    if (s.substr(0, BUILTIN_SPELLING.size()) == BUILTIN_SPELLING) return true;
     for (std::string_view prefix : {"t", "LAB", "ng", "nl"}) {
         if (s.size() <= prefix.size() || s.substr(0, prefix.size()) != prefix) continue;
         bool digits = true;
@@ -196,6 +201,25 @@ bool DecompileC::discardNeedsNot(ExprBase* x) const {
     return sig && sig->library && sig->returnType != VOID;
 }
 
+// Sound, GCC flavour: a function named like a GCC built-in, other than the C
+// library's own, is spelled zoa_builtin_<name> in C and keeps its symbol
+// through an asm label, so GCC neither refuses its declaration nor replaces
+// its calls with the built-in's meaning.
+bool DecompileC::spelledApart(const String& name) const {
+    if (!sound || !isGcc || !ctext::isGccBuiltinName(view(name))) return false;
+    const CallSignature* sig = signatures ? signatures->find(view(name)) : nullptr;
+    return !(sig && sig->library);
+}
+
+void DecompileC::writeFunctionName(const String& name) {
+    if (spelledApart(name)) sink << BUILTIN_SPELLING;
+    sink << name;
+}
+
+void DecompileC::writeAsmLabel(const String& name) {
+    if (spelledApart(name)) sink << " __asm__(\"" << name << "\")";
+}
+
 void DecompileC::writeSoundCall(CALL* c) {
     const String& name = c->getFunctionName();
     const CallSignature* sig = signatures ? signatures->find(view(name)) : nullptr;
@@ -204,7 +228,7 @@ void DecompileC::writeSoundCall(CALL* c) {
     bool cast = sig && CallSignatures::needsResultCast(*sig, c);
     if (voidValue || cast) sink << '(';
     if (cast) writeCast(c->getDataType());
-    sink << name;
+    writeFunctionName(name);
     writeArgList(c, sig ? &sig->params : nullptr);
     if (voidValue) {
         sink << ", ";
@@ -230,7 +254,9 @@ void DecompileC::declareSignature(const std::string& name, const CallSignature& 
     }
     // No "static", whatever the calls say: the function is not defined here.
     writeTypeName(sig.returnType);
-    sink << name << '(';
+    String spelled(name);
+    writeFunctionName(spelled);
+    sink << '(';
     bool first = true;
     for (DataType t : sig.params) {
         if (!first) sink << ", ";
@@ -239,17 +265,17 @@ void DecompileC::declareSignature(const std::string& name, const CallSignature& 
     }
     if (sig.variadic && !sig.params.empty()) sink << ", ...";
     if (!sig.variadic && sig.params.empty()) sink << "void";
-    sink << ");\n";
+    sink << ')';
+    writeAsmLabel(spelled);
+    sink << ";\n";
 }
 
 bool DecompileC::writeSoundUnit(ZOA_file& unit, std::ostream& diag) {
     NameCheck check(diag);
     CallSignatures sigs;
-    sigs.decide(unit, [&check](TreeBase* n) {
-        if (n->getNodeType() != CONST_NODE) return;
-        CONST* c = static_cast<CONST*>(n);
-        if (c->getDataType() == POINTER && c->getPValue()) check.fail("a POINTER constant holds C text, which means nothing here");
-    });
+    sigs.decide(unit);
+    for (std::size_t i = 0; i < sigs.textConstants().size(); ++i)
+        check.fail("a POINTER constant holds C text, which means nothing here");
     for (SUBPROG* sp : unit.getSubprogs())
         if (sp) check.function(view(sp->getName()), true);
     for (auto& entry : sigs.all())

@@ -194,7 +194,8 @@ void DecompileC::visit(SUBPROG* sp) {
     if (sp->isStatic()) sink << "static ";
     if (sp->isExtern()) sink << "extern ";
     writeTypeName(sp->getReturnType());
-    sink << sp->getName() << '(';
+    writeFunctionName(sp->getName());
+    sink << '(';
 
     usedTemps.begin(sp);
     bool first = true;
@@ -349,7 +350,10 @@ void DecompileC::defineName(NAME* n) {
             NameKind k = e && e->getNodeType() == NAME_NODE ? static_cast<NAME*>(e)->getKind() : LABEL_REF;
             if (sound && firstValue && !(e && e->getNodeType() == NAME_NODE && firstValue->getDataType() == POINTER))
                 writeSoundCast(firstValue->getDataType(), e);
-            if (k == SUBPROG_REF) sink << "(void *)" << static_cast<NAME*>(e)->getStringValue();
+            if (k == SUBPROG_REF) {
+                sink << "(void *)";
+                writeFunctionName(static_cast<NAME*>(e)->getStringValue());
+            }
             else if (k == STRINGLIT_REF) writeQuotedString(static_cast<NAME*>(e)->getStringValue());
             else printFlat(e);
         }
@@ -404,7 +408,8 @@ void DecompileC::declareSubprogPrototype(SUBPROG* sp) {
     if (sp->isStatic()) sink << "static ";
     if (sp->isExtern()) sink << "extern ";
     writeTypeName(sp->getReturnType());
-    sink << sp->getName() << '(';
+    writeFunctionName(sp->getName());
+    sink << '(';
     bool first = true;
     for (TEMP* t : sp->getAllArgTemps()) {
         if (!first) sink << ", ";
@@ -412,6 +417,7 @@ void DecompileC::declareSubprogPrototype(SUBPROG* sp) {
         if (t) writeTypeName(t->getDataType());
     }
     sink << ')';
+    writeAsmLabel(sp->getName());
     // A static function nothing calls is no error in the sound text.
     if (sound && isGcc && sp->isStatic()) sink << " __attribute__((unused))";
     sink << ";\n";
@@ -419,7 +425,11 @@ void DecompileC::declareSubprogPrototype(SUBPROG* sp) {
 
 void DecompileC::declareNamePrototype(NAME* n) {
     if (!n) return;
-    sink << "void " << n->getStringValue() << "();\n";
+    sink << "void ";
+    writeFunctionName(n->getStringValue());
+    sink << "()";
+    writeAsmLabel(n->getStringValue());
+    sink << ";\n";
 }
 
 }  // namespace ZOA

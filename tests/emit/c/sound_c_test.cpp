@@ -275,6 +275,46 @@ TEST(SoundC, AlignmentRequestsInBothFlavours) {
     EXPECT_EQ(n->getAlignment(), 0u);
 }
 
+void logicalOperators(ZOA_file& u) {
+    SUBPROG* f = u.createSubprog(INT_S, "f", false);
+    TEMP* a = f->getArgTemp(INT64_S);
+    TEMP* b = f->getArgTemp(INT_S);
+    auto product = [&] { return new UNOP(INT_S, CONV20, new BINOP(INT64_S, MUL, a, b)); };
+    ExprBase* orOf = new BINOP(INT_S, OR, product(), a);
+    ExprBase* andOf = new BINOP(INT_S, AND, new BINOP(INT_S, LSHIFT, b, new CONST(3)), new CONST(DOUBLE, 0.5));
+    ExprBase* notOf = new UNOP(INT_S, NOT, product());
+    start(f)->addStmt(new MOVE(ret(f), new BINOP(INT_S, PLUS, orOf,
+        new BINOP(INT_S, PLUS, new BINOP(INT_S, MUL, andOf, new CONST(2)), new BINOP(INT_S, MUL, notOf, new CONST(4))))));
+}
+
+// gcc reports a product or shift under && || ! after folding, with no
+// location, so no pragma reaches it: the text must compare with 0 itself.
+TEST(SoundC, LogicalOperatorsLeaveNoNumberInBooleanContext) {
+    std::string dir = scratchDir();
+    Emitted sound = emit(logicalOperators, Profile::SOUND);
+    EXPECT_NE(sound.text.find(" != 0) || ("), std::string::npos) << sound.text;
+    EXPECT_NE(sound.text.find(" == 0))"), std::string::npos) << sound.text;
+    std::string unit = writeFile(dir, "unit.c", sound.text);
+    for (const char* level : {"-O0", "-O2"}) {
+        auto built = runCommand(std::string("gcc -m32 -c ") + level + " " + STRICT + " -o '" + unit + ".o' '" + unit + "'");
+        EXPECT_EQ(built.status, 0) << level << "\n" << built.output;
+    }
+    EXPECT_EQ(run(dir, sound.text,
+                  "int f(long long, int);\nint main(void) { printf(\"%d %d %d %d\", f(0, 5), f(3, 0), f(1LL << 32, 2), f(3, 1)); return 0; }\n"),
+              "6 5 7 3");
+    ZOA_file u(true, false, Profile::SOUND);
+    logicalOperators(u);
+    std::string got;
+    for (auto [x, y] : {std::pair<long long, int>{0, 5}, {3, 0}, {1LL << 32, 2}, {3, 1}}) {
+        interp::Result r = interp::run(u, "f", {interp::Value::integer(INT64_S, x), interp::Value::integer(INT_S, y)});
+        got += (got.empty() ? "" : " ") + (r.ok() ? interp::format(r.value) : r.message);
+    }
+    EXPECT_EQ(got, "6 5 7 3");
+    Emitted msvc = emit(logicalOperators, Profile::SOUND, false);
+    EXPECT_NE(msvc.text.find(" != 0) || ("), std::string::npos) << msvc.text;
+    EXPECT_EQ(emit(logicalOperators, Profile::EXACT).text.find("!= 0"), std::string::npos);
+}
+
 // ---- declarations of external functions ----
 
 TEST(SoundC, LibraryFunctionsAreDeclaredAsTheirHeadersDo) {
@@ -338,6 +378,72 @@ TEST(SoundC, DisagreeingCallsGetAVariadicDeclaration) {
         "  while (n--) s += va_arg(ap, double); va_end(ap); return s; }\n"
         "void noargs() {}\ndouble f(void);\nint main(void) { printf(\"%g\", f()); return 0; }\n";
     EXPECT_EQ(run(dir, sound.text, harness), "7");
+
+    // A variadic argument has its node's type: a char sum wraps before it is
+    // promoted, though its C text alone would have type unsigned int.
+    auto charSum = [](ZOA_file& u) {
+        SUBPROG* g = u.createSubprog(INT_S, "g", false);
+        auto wrapped = new BINOP(CHAR_S, PLUS, new CONST(INT_U, 250u), new CONST(INT_U, 10u));
+        start(g)->addStmt(new MOVE(ret(g), new CALL(INT_S, "zoa_vsum", std::vector<ExprBase*>{new CONST(1), wrapped})));
+        start(g)->addStmt(new EXP(new CALL(INT_S, "zoa_vsum", std::vector<ExprBase*>{new CONST(0)})));
+    };
+    Emitted chars = emit(charSum, Profile::SOUND);
+    ASSERT_TRUE(compilesStrictly(dir, chars.text)) << chars.text;
+    const char* vsum =
+        "int zoa_vsum(int n, ...) { va_list ap; int s = 0; va_start(ap, n);\n"
+        "  while (n--) s += va_arg(ap, int); va_end(ap); return s; }\n"
+        "int g(void);\nint main(void) { printf(\"%d\", g()); return 0; }\n";
+    EXPECT_EQ(run(dir, chars.text, vsum), "4");
+    EXPECT_EQ(interpreted(charSum, "g"), "4");
+}
+
+void builtinNames(ZOA_file& u) {
+    auto define = [&](const char* name, DataType arg, auto body) {
+        SUBPROG* s = u.createSubprog(INT_S, name, false);
+        TEMP* a = s->getArgTemp(arg);
+        TEMP* b = std::string(name) == "putchar" ? s->getArgTemp(INT_S) : nullptr;
+        start(s)->addStmt(new MOVE(ret(s), body(a, b)));
+    };
+    define("abs", INT_S, [](TEMP* a, TEMP*) { return new BINOP(INT_S, PLUS, a, new CONST(100)); });
+    define("index", CHAR_S, [](TEMP* a, TEMP*) { return new BINOP(INT_S, MUL, a, new CONST(2)); });
+    define("nan", INT_S, [](TEMP* a, TEMP*) { return new BINOP(INT_S, MUL, a, a); });
+    define("putchar", INT_S, [](TEMP* a, TEMP* b) { return new BINOP(INT_S, MINUS, a, b); });
+    NAME* table = u.createData(std::list<ExprBase*>{u.getName(SUBPROG_REF, "abs")});
+    SUBPROG* f = u.createSubprog(INT_S, "f", false);
+    TEMP* p = f->getTemp(POINTER, 0, IN_USE_TEMP);
+    auto call = [](const char* name, std::vector<ExprBase*> args) { return new CALL(INT_S, name, args); };
+    ExprBase* sum = new BINOP(INT_S, PLUS, call("abs", {new CONST(-5)}), call("index", {new CONST(CHAR_S, 3)}));
+    sum = new BINOP(INT_S, PLUS, sum, call("nan", {new CONST(4)}));
+    sum = new BINOP(INT_S, PLUS, sum, call("putchar", {new CONST(10), new CONST(4)}));
+    start(f)->addStmt(new MOVE(p, new MEM(POINTER, table)));
+    start(f)->addStmt(new MOVE(ret(f), new BINOP(INT_S, PLUS, sum, new CALL(INT_S, p, std::vector<ExprBase*>{new CONST(1)}))));
+    // External functions named like built-ins, called with signatures of their own.
+    SUBPROG* g = u.createSubprog(INT_S, "g", false);
+    start(g)->addStmt(new EXP(new CALL(VOID, "bzero", std::vector<ExprBase*>{})));
+    start(g)->addStmt(new MOVE(ret(g), new BINOP(INT_S, PLUS, call("rindex", {new CONST(1)}), call("strlen", {u.getName(STRINGLIT_REF, "abc")}))));
+}
+
+// Functions named like GCC built-ins: declared without a clash, and called as
+// written at every level (gcc would fold a built-in abs(-5) to 5).
+TEST(SoundC, FunctionsNamedLikeBuiltinsKeepTheirOwnMeaning) {
+    std::string dir = scratchDir();
+    EXPECT_FALSE(compilesStrictly(dir, "typedef long long int64;\n" + emit(builtinNames, Profile::EXACT).text));
+    Emitted sound = emit(builtinNames, Profile::SOUND);
+    ASSERT_TRUE(compilesStrictly(dir, sound.text)) << sound.text;
+    EXPECT_NE(sound.text.find("int zoa_builtin_abs(int ) __asm__(\"abs\");"), std::string::npos) << sound.text;
+    EXPECT_NE(sound.text.find("int zoa_builtin_rindex(int ) __asm__(\"rindex\");"), std::string::npos);
+    EXPECT_NE(sound.text.find("unsigned int strlen(const char *);"), std::string::npos);  // the library's own
+    // The harness defines the externals under their symbols, as a library would.
+    std::string unit = writeFile(dir, "unit.c", sound.text);
+    std::string main = writeFile(dir, "main.c",
+                                 "#include <stdio.h>\nint f(void); int g(void);\n"
+                                 "int lib_rindex(int x) __asm__(\"rindex\");\nint lib_rindex(int x) { return x + 40; }\n"
+                                 "void lib_bzero(void) __asm__(\"bzero\");\nvoid lib_bzero(void) {}\n"
+                                 "int main(void) { printf(\"%d %d\", f(), g()); return 0; }\n");
+    for (const char* level : {"-O0", "-O2"})
+        EXPECT_EQ(buildAndRun32(dir, {unit, main}, level).output, "224 44") << level;
+    EXPECT_EQ(interpreted(builtinNames, "f"), "224");
+    EXPECT_EQ(emit(builtinNames, Profile::SOUND, false).text.find("zoa_builtin_"), std::string::npos);
 }
 
 // ---- names the C text cannot carry ----
@@ -350,6 +456,8 @@ TEST(SoundC, UnwritableNamesAreRefusedAndReported) {
         {"is not a C identifier", [](ZOA_file& u) { u.createSubprog(VOID, "two words", false); }},
         {"is a C keyword", [](ZOA_file& u) { u.getName(EXTERN_DATA_REF, "int"); }},
         {"clashes with a name the C output makes", [](ZOA_file& u) { u.createSubprog(VOID, "t3", false); }},
+        {"'zoa_builtin_abs' clashes with a name the C output makes",
+         [](ZOA_file& u) { u.createSubprog(VOID, "zoa_builtin_abs", false); }},
         {"names both a function and data",
          [](ZOA_file& u) {
              u.getName(EXTERN_DATA_REF, "x");
