@@ -14,8 +14,8 @@ bool ZOA_file::decompile(std::ostream& os) {
     if (!checkCurrent()) return false;
     if (profile == Profile::SOUND && asmMode) {
         {
-            SoundX86 x86(os, subprogs);
-            x86.writeUnit(names, subprogs);
+            SoundX86 x86(os, *this);
+            x86.writeUnit();
         }
         names.clear();
         subprogs.clear();

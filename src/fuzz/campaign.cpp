@@ -356,9 +356,10 @@ CampaignStats runDifferential(const CampaignOptions& o) {
         Prepared p;
         p.seed = seed;
         p.prefix = "u" + std::to_string(seed) + "_";
-        // The sound assembly runs the exact C mode's units, with names stepping by bytes.
+        // The sound assembly runs the sound C mode's units (calls of one name
+        // with several arities, private and aligned data), names stepping by bytes.
         Target target{true, o.mode == Mode::ASM || o.soundAsm,
-                      o.mode == Mode::C && !o.soundAsm ? o.profile : Profile::EXACT, o.soundAsm};
+                      o.soundAsm ? Profile::SOUND : o.mode == Mode::C ? o.profile : Profile::EXACT, o.soundAsm};
         Generated g = generate(seed, o.mode, p.prefix, o.asmQuirks, target);
         if (o.soundAsm) g.unit->setProfile(Profile::SOUND);
         p.text = text::write(*g.unit);

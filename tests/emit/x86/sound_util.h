@@ -28,6 +28,15 @@ inline std::string soundAsm(ZOA_file& unit) {
     return os.str();
 }
 
+// The unit's sound C text, for a program that runs it beside the assembly.
+inline std::string soundC(ZOA_file& unit) {
+    unit.setProfile(Profile::SOUND);
+    std::ostringstream os, diag;
+    unit.setDiagnosticStream(&diag);
+    EXPECT_TRUE(unit.decompile(os)) << diag.str();
+    return os.str();
+}
+
 // Static subprograms made reachable from a test driver (the assembler takes a
 // .globl anywhere in the file).
 inline std::string exportingStatics(const ZOA_file& unit) {

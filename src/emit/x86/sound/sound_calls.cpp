@@ -26,36 +26,62 @@ void SoundX86::storeArgument(CT t, long long offset) {
     }
 }
 
+// The type an argument is passed as: the declared parameter's while there
+// is one, past them C's default promotions (FLOAT as DOUBLE, chars as int),
+// as the C compiler passes them for the declaration the sound C writes.
+// A call through a pointer declares the arguments' own types.
+SoundX86::CT SoundX86::argumentType(const CallSignature* sig, std::size_t i, ExprBase* a) {
+    DataType t = a ? a->getDataType() : INT_S;
+    if (sig && i < sig->params.size() && sig->params[i] != VOID) t = sig->params[i];
+    else if (sig && t == FLOAT) t = DOUBLE;
+    CT c = ctypes::ctOf(t);
+    return c == CT::VOID || (sig && i >= sig->params.size() && ctypes::bitsOf(c) == 8) ? CT::INT : c;
+}
+
+// Zero of a type in the value registers: what a value asked of a void function is.
+void SoundX86::zeroValue(CT t) {
+    if (ctypes::isReal(t)) {
+        ins() << "fldz\n";
+        return;
+    }
+    ins() << "xor\teax, eax\n";
+    if (ctypes::is64(t)) ins() << "xor\tedx, edx\n";
+}
+
 // Arguments are evaluated left to right, as the interpreter does, each into
 // its slot of an area reserved first, so that calls nested in arguments find
-// the stack aligned too.
+// the stack aligned too. Only the argument loop is here: calls nested as deep
+// as the walks go keep this frame small.
 SoundX86::VT SoundX86::genCall(CALL* c) {
-    TEMP* fp = c->getFunctionPointer();
+    if (!c->getFunctionPointer() && named(c->getFunctionName(), "alloca")) return genAlloca(c);
+    const CallSignature* sig = signatureOf(c);
+    unsigned area = reserveArguments(c, sig);
+    std::size_t i = paramStack.size() - c->getArgs().size();
+    long long offset = 0;
+    for (ExprBase* a : c->getArgs()) {
+        CT t = paramStack[i++];
+        convert(value(a), t);
+        storeArgument(t, offset);
+        offset += slotBytes(t);
+    }
+    return makeCall(c, sig, area);
+}
+
+const CallSignature* SoundX86::signatureOf(CALL* c) const {
     const String& name = c->getFunctionName();
-    if (!fp && named(name, "alloca")) return genAlloca(c);
-    SUBPROG* callee = nullptr;
-    if (!fp) {
-        auto it = subprogByName.find(std::string(name.data(), name.size()));
-        if (it != subprogByName.end()) callee = it->second;
-    }
-    // A subprogram of the unit takes its parameters' types; any other callee
-    // the arguments' own, as the call's prototype declares them.
-    std::size_t base = paramStack.size();
+    return c->getFunctionPointer() ? nullptr : signatures.find(std::string_view(name.data(), name.size()));
+}
+
+// The arguments' types onto paramStack and their area, padded so that esp is
+// 16-byte aligned at the call; the bytes reserved.
+unsigned SoundX86::reserveArguments(CALL* c, const CallSignature* sig) {
     unsigned bytes = 0;
-    {
-        auto param = callee ? callee->getAllArgTemps().begin() : TempList::const_iterator();
-        for (ExprBase* a : c->getArgs()) {
-            CT t = a ? ctypes::ctOf(a->getDataType()) : CT::INT;
-            if (callee && param != callee->getAllArgTemps().end()) {
-                if (*param) t = ctypes::ctOf((*param)->getDataType());
-                ++param;
-            }
-            if (t == CT::VOID) t = CT::INT;
-            paramStack.push_back(t);
-            bytes += slotBytes(t);
-        }
+    std::size_t i = 0;
+    for (ExprBase* a : c->getArgs()) {
+        CT t = argumentType(sig, i++, a);
+        paramStack.push_back(t);
+        bytes += slotBytes(t);
     }
-    CT ret = callee ? ctypes::ctOf(callee->getReturnType()) : ctypes::ctOf(c->getDataType());
     unsigned pad = (16 - (depth + bytes) % 16) % 16;
     if (pad + bytes) {
         ins() << "sub\tesp, ";
@@ -63,16 +89,13 @@ SoundX86::VT SoundX86::genCall(CALL* c) {
         end();
     }
     depth += pad + bytes;
-    long long offset = 0;
-    std::size_t i = base;
-    for (ExprBase* a : c->getArgs()) {
-        CT t = paramStack[i++];
-        convert(value(a), t);
-        storeArgument(t, offset);
-        offset += slotBytes(t);
-    }
-    paramStack.resize(base);
-    if (fp) {
+    return pad + bytes;
+}
+
+SoundX86::VT SoundX86::makeCall(CALL* c, const CallSignature* sig, unsigned area) {
+    paramStack.resize(paramStack.size() - c->getArgs().size());
+    const String& name = c->getFunctionName();
+    if (TEMP* fp = c->getFunctionPointer()) {
         convert(genTemp(fp), CT::POINTER);
         ins() << "call\teax\n";
     } else if (name.empty()) {
@@ -80,10 +103,19 @@ SoundX86::VT SoundX86::genCall(CALL* c) {
     } else {
         ins() << "call\t" << name << "@PLT\n";
     }
-    if (pad + bytes) drop(pad + bytes);
+    drop(area);
+    // The value is what the function really returns (a unit's subprogram or
+    // a C library function), converted to the call's type as the C casts it.
+    DataType wanted = c->getDataType();
+    DataType real = sig && (sig->library || sig->defined) ? sig->returnType : wanted;
+    CT ret = ctypes::ctOf(real);
     if (ret == CT::SCHAR) ins() << "movsx\teax, al\n";
     if (ret == CT::UCHAR) ins() << "movzx\teax, al\n";
-    return VT{ret, 1};
+    if (wanted == VOID || wanted == real) return VT{ret, 1};
+    CT to = ctypes::ctOf(wanted);
+    if (ret == CT::VOID) zeroValue(to);
+    else convert(VT{ret, 1}, to);
+    return VT{to, 1};
 }
 
 // Stack memory that lives until the subprogram returns: esp goes down by the

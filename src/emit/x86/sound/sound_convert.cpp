@@ -1,4 +1,4 @@
-// SoundX86: the conversions between C types in the value registers, and truth values.
+// SoundX86: the conversions between C types in the value registers, truth values and ABS.
 #include "emit/x86/sound/sound_x86.h"
 
 namespace ZOA {
@@ -124,6 +124,42 @@ void SoundX86::truth(CT t) {
     if (ctypes::is64(t)) ins() << "or\teax, edx\n";
     else ins() << "test\teax, eax\n";
     setFlag("ne");
+}
+
+// ABS as the C writes it, (x>=0?x: -x): x is evaluated twice.
+SoundX86::VT SoundX86::genAbs(ExprBase* x) {
+    VT a = value(x);
+    CT c = ctypes::promote(a.t);
+    convert(a, c);
+    if (ctypes::isReal(c)) {
+        ins() << "ftst\n";
+        ins() << "fnstsw\tax\n";
+        ins() << "sahf\n";
+        ins() << "fstp\tst(0)\n";
+        setFlag("ae");
+    } else if (!ctypes::isSigned(c)) {
+        ins() << "mov\teax, 1\n";
+    } else {
+        ins() << "test\t" << (ctypes::is64(c) ? "edx, edx\n" : "eax, eax\n");
+        setFlag("ns");
+    }
+    pushValue(CT::INT);
+    convert(value(x), c);
+    std::string done = internalLabel();
+    ins() << "cmp\tDWORD PTR [esp], 0\n";
+    ins() << "jne\t" << done << '\n';
+    if (ctypes::isReal(c)) {
+        ins() << "fchs\n";
+    } else if (ctypes::is64(c)) {
+        ins() << "neg\teax\n";
+        ins() << "adc\tedx, 0\n";
+        ins() << "neg\tedx\n";
+    } else {
+        ins() << "neg\teax\n";
+    }
+    defineInternal(done);
+    drop(4);
+    return VT{c, 1};
 }
 
 }  // namespace ZOA

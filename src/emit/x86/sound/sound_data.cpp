@@ -155,9 +155,10 @@ void SoundX86::defineName(NAME* n) {
     if (!n) return;
     const ExprList& values = n->getList();
     NameKind k = n->getKind();
-    auto head = [&](const char* section, unsigned align) {
-        sink << '\t' << section << "\n\t.align\t";
-        sink.writeUnsigned(align);
+    // The values' natural alignment, raised to the one asked (as the C's aligned attribute does).
+    auto head = [&](const char* section, unsigned natural) {
+        sink << '\t' << section << "\n\t.balign\t";
+        sink.writeUnsigned(n->getAlignment() > natural ? n->getAlignment() : natural);
         sink << '\n';
         symbolOf(n);
         sink << ":\n";
@@ -167,9 +168,11 @@ void SoundX86::defineName(NAME* n) {
     case DATA_ARRAY_REF: {
         ExprBase* first = values.empty() ? nullptr : values.front();
         if (!first || sizeOfType(first->getDataType()) == 0) {
-            // Nothing to size it by: a byte, as the C's char[1].
+            // Zero-filled data of its size; with nothing to size it by, a byte, as the C's char[1].
             head(".bss", 1);
-            ins() << ".zero\t1\n";
+            ins() << ".zero\t";
+            sink.writeUnsigned(n->getZeroBytes() ? n->getZeroBytes() : 1);
+            end();
             return;
         }
         DataType et = first->getDataType();

@@ -194,12 +194,7 @@ SoundX86::VT SoundX86::genName(NAME* n) {
 }
 
 SoundX86::VT SoundX86::genTemp(TEMP* t) {
-    if (t->getNodeType() == BUF_TEMP_NODE) {
-        ins() << "lea\teax, ";
-        memOperand("DWORD", "ebp", slotOf(t));
-        end();
-        return VT{CT::POINTER, 1};
-    }
+    if (t->getNodeType() == BUF_TEMP_NODE) return bufferAddress(static_cast<BUF_TEMP*>(t));
     CT c = ctypes::ctOf(t->getDataType());
     loadFrom(c, "ebp", slotOf(t));
     return VT{c, 1};
@@ -217,41 +212,7 @@ SoundX86::VT SoundX86::genUnop(UNOP* u) {
     UnopKind op = u->getOp();
     ExprBase* x = u->getExpr();
     switch (op) {
-    case ABS: {
-        // (x>=0?x: -x): x is evaluated twice, as the C text does.
-        VT a = value(x);
-        CT c = ctypes::promote(a.t);
-        convert(a, c);
-        if (ctypes::isReal(c)) {
-            ins() << "ftst\n";
-            ins() << "fnstsw\tax\n";
-            ins() << "sahf\n";
-            ins() << "fstp\tst(0)\n";
-            setFlag("ae");
-        } else if (!ctypes::isSigned(c)) {
-            ins() << "mov\teax, 1\n";
-        } else {
-            ins() << "test\t" << (ctypes::is64(c) ? "edx, edx\n" : "eax, eax\n");
-            setFlag("ns");
-        }
-        pushValue(CT::INT);
-        convert(value(x), c);
-        std::string done = internalLabel();
-        ins() << "cmp\tDWORD PTR [esp], 0\n";
-        ins() << "jne\t" << done << '\n';
-        if (ctypes::isReal(c)) {
-            ins() << "fchs\n";
-        } else if (ctypes::is64(c)) {
-            ins() << "neg\teax\n";
-            ins() << "adc\tedx, 0\n";
-            ins() << "neg\tedx\n";
-        } else {
-            ins() << "neg\teax\n";
-        }
-        defineInternal(done);
-        drop(4);
-        return VT{c, 1};
-    }
+    case ABS: return genAbs(x);  // out of line: its label keeps the deep walks' frames small
     case NEG:
     case BITWISE_NOT: {
         VT a = value(x);

@@ -34,11 +34,30 @@ long long SoundX86::slotOf(TEMP* t) {
         size = (static_cast<long long>(static_cast<BUF_TEMP*>(t)->getArraySize()) + 7) / 8 * 8;
         if (size == 0) size = 8;
         align = 16;
+        // The frame is 16-byte aligned at most: room to round the address up at run time.
+        unsigned asked = static_cast<BUF_TEMP*>(t)->getAlignment();
+        if (asked > 16) size += asked - 16;
     }
     below += size;
     while ((8 - below) % align != 0) below += 4;
     slots.emplace(t, -below);
     return -below;
+}
+
+SoundX86::VT SoundX86::bufferAddress(BUF_TEMP* b) {
+    ins() << "lea\teax, ";
+    memOperand("DWORD", "ebp", slotOf(b));
+    end();
+    unsigned asked = b->getAlignment();
+    if (asked > 16) {
+        ins() << "add\teax, ";
+        sink.writeUnsigned(asked - 1);
+        end();
+        ins() << "and\teax, ";
+        num(-static_cast<long long>(asked));
+        end();
+    }
+    return VT{CT::POINTER, 1};
 }
 
 void SoundX86::store(CT t, const char* base, long long offset) {

@@ -3,32 +3,33 @@
 
 #include <zoa/nesting.h>
 #include <zoa/stmt.h>
+#include <zoa/zoa_file.h>
 
 #include <unordered_set>
 
 namespace ZOA {
 
-SoundX86::SoundX86(std::ostream& os, const std::list<SUBPROG*>& subprogs) : DecompileBase(os, true), sink(os) {
+SoundX86::SoundX86(std::ostream& os, ZOA_file& file) : DecompileBase(os, true), sink(os), unit(file) {
+    signatures.decide(unit);
     unsigned index = 0;
-    for (SUBPROG* sp : subprogs) {
+    for (SUBPROG* sp : unit.getSubprogs()) {
         if (!sp) continue;
         for (const auto& entry : sp->getAllLabels())
             if (entry.second) labelOwner.emplace(entry.second, index);
         for (NAME* n : sp->getAllLocalNames())
             if (n) localOwner.emplace(n, index);
-        subprogByName.emplace(std::string(sp->getName().data(), sp->getName().size()), sp);
         ++index;
     }
 }
 
 SoundX86::~SoundX86() {}
 
-void SoundX86::writeUnit(const std::list<NAME*>& names, const std::list<SUBPROG*>& subprogs) {
+void SoundX86::writeUnit() {
     sink << "\t.intel_syntax noprefix\n";
-    for (NAME* n : names) defineName(n);
+    for (NAME* n : unit.getNames()) defineName(n);
     writeStringPool();
     subprogIndex = 0;
-    for (SUBPROG* sp : subprogs) {
+    for (SUBPROG* sp : unit.getSubprogs()) {
         if (!sp) continue;
         emitSubprogram(sp);
         ++subprogIndex;

@@ -3,6 +3,7 @@
 #define ZOA_EMIT_X86_SOUND_SOUND_X86_H
 
 #include "core/c_types.h"
+#include "emit/call_signatures.h"
 #include "emit/decompile_base.h"
 #include "support/text_sink.h"
 
@@ -45,11 +46,11 @@ public:
     static CVal constValue(CONST* c);
     static CVal convertValue(const CVal& v, CT to);
 
-    SoundX86(std::ostream& os, const std::list<SUBPROG*>& subprogs);
+    SoundX86(std::ostream& os, ZOA_file& unit);
     ~SoundX86() override;
 
     // The whole unit: data, subprograms, the PC thunk.
-    void writeUnit(const std::list<NAME*>& names, const std::list<SUBPROG*>& subprogs);
+    void writeUnit();
 
 #define ZOA_NODE_KIND(kind, Class) void visit(Class*) override;
 #include "core/node_kinds.def"
@@ -84,6 +85,7 @@ private:
     // ---- frame and statements (sound_stmts.cpp)
     void layoutFrame(SUBPROG* sp);
     long long slotOf(TEMP* t);  // a slot is given on first use
+    VT bufferAddress(BUF_TEMP* b);  // aligned as asked
     void statement(StmtBase* s);
     void move(MOVE* m);
     void returnSequence();
@@ -98,6 +100,7 @@ private:
     VT genTemp(TEMP* t);
     VT genMem(MEM* m);
     VT genUnop(UNOP* u);
+    VT genAbs(ExprBase* x);
     VT genBinop(BinopKind op, ExprBase* l, ExprBase* r);
     VT genArith(BinopKind op, VT l, VT r);
     bool genDirect(BinopKind op, VT l, ExprBase* r, VT& result);
@@ -122,9 +125,14 @@ private:
 
     // ---- calls (sound_calls.cpp)
     VT genCall(CALL* c);
+    const CallSignature* signatureOf(CALL* c) const;  // null for a call through a pointer
+    unsigned reserveArguments(CALL* c, const CallSignature* sig);
+    VT makeCall(CALL* c, const CallSignature* sig, unsigned area);
     VT genAlloca(CALL* c);
     void callHelper(const char* name);  // libgcc's 64-bit division: left in edx:eax, right at [esp]
     void storeArgument(CT t, long long offset);
+    static CT argumentType(const CallSignature* sig, std::size_t i, ExprBase* a);
+    void zeroValue(CT t);
 
     static unsigned slotBytes(CT t) { return ctypes::bitsOf(t) == 64 ? 8 : 4; }
     // What a pushed value takes: FLOAT and DOUBLE are pushed as doubles.
@@ -134,7 +142,8 @@ private:
     TextSink sink;
     TextSink::Batch batch{sink};
     std::unordered_map<const LABEL*, unsigned> labelOwner;  // label -> subprogram index
-    std::unordered_map<std::string, SUBPROG*> subprogByName;  // the first of each name
+    ZOA_file& unit;
+    CallSignatures signatures;  // the declarations the sound C writes, so calls pass what they mean
     std::unordered_map<const TEMP*, long long> slots;  // ebp offsets
     long long below = 12;  // bytes of the frame below ebp so far
     unsigned subprogIndex = 0;
