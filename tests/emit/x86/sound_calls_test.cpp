@@ -40,6 +40,11 @@ TEST(SoundAsmCalls, VariadicCalleesGetPromotedArguments) {
         l->addStmt(new MOVE(n, new CALL(INT_S, "show", {u.getName(STRINGLIT_REF, "%.9g %d\\n"), x, c})));
         l->addStmt(new EXP(new CALL(INT_S, "show", {u.getName(STRINGLIT_REF, "%.17g %u %lld %.9g\\n"), d, b, q, x})));
         l->addStmt(new EXP(new CALL(VOID, "printf", {u.getName(STRINGLIT_REF, "%.9g|%c|%d\\n"), x, c, b})));
+        // Nodes whose C value is wider than their type: converted to the
+        // node's type, then promoted (a char of an unsigned shift, a float of a double sum).
+        l->addStmt(new EXP(new CALL(INT_S, "show", {u.getName(STRINGLIT_REF, "%d %.17g\\n"),
+                                                    new BINOP(CHAR_S, LSHIFT, new CONST(3107615678u), new CONST(0)),
+                                                    new BINOP(FLOAT, PLUS, d, new CONST(0.1))})));
         l->addStmt(new MOVE(sp->getReturnTemp(), new BINOP(INT_S, PLUS, n, new CALL(INT_S, "show", {u.getName(STRINGLIT_REF, "-\\n")}))));
     };
     std::string driver =
@@ -51,6 +56,7 @@ TEST(SoundAsmCalls, VariadicCalleesGetPromotedArguments) {
     auto [fromC, fromAsm] = runBoth(build, driver);
     EXPECT_EQ(fromAsm, fromC);
     EXPECT_NE(fromC.find("1.25 65\n"), std::string::npos) << fromC;
+    EXPECT_NE(fromC.find("-66 -2.4000000953674316\n"), std::string::npos) << fromC;
 }
 
 // C library functions take their header's parameter types and give their

@@ -58,9 +58,18 @@ SoundX86::VT SoundX86::genCall(CALL* c) {
     unsigned area = reserveArguments(c, sig);
     std::size_t i = paramStack.size() - c->getArgs().size();
     long long offset = 0;
+    std::size_t k = 0;
     for (ExprBase* a : c->getArgs()) {
         CT t = paramStack[i++];
-        convert(value(a), t);
+        VT v = value(a);
+        // Past a declaration's fixed part the sound C casts an argument to
+        // its node's type (the value the tree means) before C promotes it.
+        CT own = a ? ctypes::ctOf(a->getDataType()) : CT::VOID;
+        if (sig && k++ >= sig->params.size() && own != CT::VOID && own != v.t) {
+            convert(v, own);
+            v = VT{own, 1};
+        }
+        convert(v, t);
         storeArgument(t, offset);
         offset += slotBytes(t);
     }
