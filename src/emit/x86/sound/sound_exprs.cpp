@@ -60,7 +60,7 @@ void SoundX86::discard(CT t) {
     if (ctypes::isReal(t)) ins() << "fstp\tst(0)\n";
 }
 
-void SoundX86::loadFrom(CT t, const char* base, long long offset) {
+void SoundX86::loadFrom(CT t, std::string_view base, long long offset) {
     switch (t) {
     case CT::SCHAR:
     case CT::UCHAR:

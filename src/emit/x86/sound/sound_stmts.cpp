@@ -60,7 +60,7 @@ SoundX86::VT SoundX86::bufferAddress(BUF_TEMP* b) {
     return VT{CT::POINTER, 1};
 }
 
-void SoundX86::store(CT t, const char* base, long long offset) {
+void SoundX86::store(CT t, std::string_view base, long long offset) {
     switch (t) {
     case CT::SCHAR:
     case CT::UCHAR:

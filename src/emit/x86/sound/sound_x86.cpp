@@ -63,7 +63,7 @@ void SoundX86::writeCutNote() { sink << "# " << CUT_NOTE << '\n'; }
 
 std::string SoundX86::internalLabel() { return ".Lz" + std::to_string(internalCount++); }
 
-void SoundX86::memOperand(const char* size, const char* base, long long offset) {
+void SoundX86::memOperand(std::string_view size, std::string_view base, long long offset) {
     sink << size << " PTR [" << base;
     if (offset >= 0) sink << '+';
     num(offset);

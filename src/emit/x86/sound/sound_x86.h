@@ -71,7 +71,7 @@ private:
     std::string internalLabel();       // .Lz<n>, a fresh one
     void defineInternal(const std::string& l) { sink << l << ":\n"; }
     void symbolOf(NAME* n);            // the assembler symbol of a data name
-    void memOperand(const char* size, const char* base, long long offset);  // SIZE PTR [base+offset]
+    void memOperand(std::string_view size, std::string_view base, long long offset);  // SIZE PTR [base+offset]
 
     // ---- data (sound_data.cpp)
     void writeLiteral(const String& text);
@@ -89,7 +89,7 @@ private:
     void statement(StmtBase* s);
     void move(MOVE* m);
     void returnSequence();
-    void store(CT t, const char* base, long long offset);  // the value, of type t, to [base+offset]
+    void store(CT t, std::string_view base, long long offset);  // the value, of type t, to [base+offset]
     void storeTemp(TEMP* t, VT v);
 
     // ---- expressions (sound_exprs.cpp)
@@ -110,7 +110,7 @@ private:
     VT genPointerArith(BinopKind op, VT l, VT r);
     VT genShift(BinopKind op, VT l, VT r);
     VT genLogical(BinopKind op, ExprBase* l, ExprBase* r);
-    void loadFrom(CT t, const char* base, long long offset);  // [base+offset] into the value registers
+    void loadFrom(CT t, std::string_view base, long long offset);  // [base+offset] into the value registers
     void convert(VT from, CT to);
     void realToInt(CT to);
     void intToReal(CT from);
