@@ -1,4 +1,4 @@
-// The text writer's output: node heads, spellings, numbers and quoted texts on a TextSink.
+// The text writer's output: node heads, spellings, numbers, quoted texts and constants on a TextSink.
 #ifndef ZOA_TEXT_WRITE_BUFFER_H
 #define ZOA_TEXT_WRITE_BUFFER_H
 
@@ -7,8 +7,11 @@
 #include "text/names.h"
 
 #include <zoa/enums.h>
+#include <zoa/expr.h>
 
+#include <cmath>
 #include <cstdio>
+#include <cstring>
 #include <ostream>
 #include <string>
 #include <string_view>
@@ -76,6 +79,37 @@ inline void writeText(Out& os, const char* s, std::size_t n) {
         }
     }
     os << '"';
+}
+
+// "(CONST <type> <value>)": floating values to 17 digits (nan, inf, -inf by
+// name; a whole number keeps a ".0"), a pointer's text quoted or null.
+inline void writeConstant(Out& os, CONST* c) {
+    DataType t = c->getDataType();
+    os << head(CONST_NODE) << spell(t) << ' ';
+    if (t == FLOAT || t == DOUBLE) {
+        double v = c->getFValue();
+        if (std::isnan(v)) {
+            os << "nan";
+        } else if (std::isinf(v)) {
+            os << (v < 0 ? "-inf" : "inf");
+        } else {
+            char buf[64];
+            std::snprintf(buf, sizeof buf, "%.17g", v);
+            os << buf;
+            if (!std::strpbrk(buf, ".e")) os << ".0";
+        }
+    } else if (t == POINTER) {
+        const char* p = static_cast<const char*>(c->getPValue());
+        if (p)
+            writeText(os, p, std::strlen(p));
+        else
+            os << "null";
+    } else if (t == INT64_U) {
+        os << static_cast<unsigned long long>(c->getIValue());
+    } else {
+        os << c->getIValue();
+    }
+    os << ')';
 }
 
 }  // namespace ZOA::text::detail

@@ -24,6 +24,7 @@ namespace {
 
 using detail::head;
 using detail::Out;
+using detail::writeConstant;
 using detail::writeText;
 
 constexpr int GLOBAL = -1;
@@ -122,7 +123,7 @@ private:
         }
         ref('L', o, ctx);
     }
-    void constant(CONST* c);
+    void constant(CONST* c) { writeConstant(os, c); }
     void expr(ExprBase* e, int ctx);
     void exprBody(ExprBase* e, int ctx);
     void stmt(StmtBase* s, int ctx, int depth);
@@ -202,35 +203,6 @@ void Writer::collectDead(std::size_t i, TreeBase* t) {
         dead[i][l->getId()] = l;
         labels[l] = {static_cast<int>(i), l->getId()};
     });
-}
-
-void Writer::constant(CONST* c) {
-    DataType t = c->getDataType();
-    os << head(CONST_NODE) << spell(t) << ' ';
-    char buf[64];
-    if (t == FLOAT || t == DOUBLE) {
-        double v = c->getFValue();
-        if (std::isnan(v)) {
-            os << "nan";
-        } else if (std::isinf(v)) {
-            os << (v < 0 ? "-inf" : "inf");
-        } else {
-            std::snprintf(buf, sizeof buf, "%.17g", v);
-            os << buf;
-            if (!std::strpbrk(buf, ".e")) os << ".0";
-        }
-    } else if (t == POINTER) {
-        const char* p = static_cast<const char*>(c->getPValue());
-        if (p)
-            writeText(os, p, std::strlen(p));
-        else
-            os << "null";
-    } else if (t == INT64_U) {
-        os << static_cast<unsigned long long>(c->getIValue());
-    } else {
-        os << c->getIValue();
-    }
-    os << ')';
 }
 
 // A tree that contains itself is written up to the repetition, then
