@@ -123,11 +123,33 @@ void CallSignatures::add(CALL* c) {
     if (!fits(it->second, c)) misfitCalls.push_back(c);
 }
 
+// Calls are met in walk order (a node's children in forEachChild's order),
+// each once however often it is shared; a shared subtree is walked again
+// for each reference, as the outputs print it, and the walk stops at
+// MAX_WALK_DEPTH levels, as theirs do.
+void CallSignatures::walk(TreeBase* n) {
+    NodeType t = n->getNodeType();
+    switch (t) {
+    case TEMP_NODE:
+    case BUF_TEMP_NODE: return;
+    case CONST_NODE: {
+        CONST* c = static_cast<CONST*>(n);
+        if (c->getDataType() == POINTER && c->getPValue() && met.insert(c)) textPointers.push_back(c);
+        return;
+    }
+    default: break;
+    }
+    NestingLevel level(nesting);
+    if (!level.entered()) return;
+    if (t == CALL_NODE && met.insert(static_cast<CALL*>(n))) add(static_cast<CALL*>(n));
+    forEachChild(n, t, [this](TreeBase* k) { walk(k); });
+}
+
 void CallSignatures::decide(ZOA_file& unit) {
     signatures.clear();
     misfitCalls.clear();
     textPointers.clear();
-    seen.clear();
+    met.clear();
     for (SUBPROG* sp : unit.getSubprogs()) {
         if (!sp) continue;
         CallSignature s;
@@ -136,40 +158,14 @@ void CallSignatures::decide(ZOA_file& unit) {
         for (TEMP* t : sp->getAllArgTemps()) s.params.push_back(t ? t->getDataType() : VOID);
         signatures.emplace(std::string(sp->getName().data(), sp->getName().size()), std::move(s));
     }
-    std::vector<TreeBase*> todo;
-    std::vector<TreeBase*> kids;
-    // Leaves are met as children: temporaries hold nothing, and only a
-    // constant holding text needs remembering (once).
-    auto child = [this, &kids](TreeBase* k) {
-        NodeType t = k->getNodeType();
-        if (t == TEMP_NODE || t == BUF_TEMP_NODE) return;
-        if (t == CONST_NODE) {
-            CONST* c = static_cast<CONST*>(k);
-            if (c->getDataType() == POINTER && c->getPValue() && !seen.contains(c)) {
-                seen.assign(c, CONST_NODE);
-                textPointers.push_back(c);
-            }
-            return;
-        }
-        kids.push_back(k);
-    };
-    for (SUBPROG* sp : unit.getSubprogs()) {
-        if (sp) todo.push_back(sp);
-        while (!todo.empty()) {
-            TreeBase* n = todo.back();
-            todo.pop_back();
-            if (seen.contains(n)) continue;
-            NodeType t = n->getNodeType();
-            seen.assign(n, t);
-            if (t == CALL_NODE) add(static_cast<CALL*>(n));
-            // Children go on the stack in reverse, so calls are met in walk order.
-            kids.clear();
-            forEachChild(n, t, child);
-            todo.insert(todo.end(), kids.rbegin(), kids.rend());
-        }
-    }
+    // Each statement is a walk of its own, so a cut ends only the statement
+    // that holds a cycle.
+    for (SUBPROG* sp : unit.getSubprogs())
+        if (sp)
+            for (const auto& entry : sp->getAllLabels())
+                if (entry.second) forEachChild(entry.second, LABEL_NODE, [this](TreeBase* st) { walk(st); });
     for (auto& entry : unit.getCallPrototypes())
-        if (entry.second && !seen.contains(entry.second)) add(entry.second);
+        if (entry.second && !met.contains(entry.second)) add(entry.second);
     for (auto& entry : unit.getNamePrototypes()) {
         const LibraryFunction* f = libraryFunction(entry.first);
         if (f && !find(entry.first)) signatures.emplace(entry.first, librarySignature(f));

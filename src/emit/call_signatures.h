@@ -2,7 +2,10 @@
 #ifndef ZOA_EMIT_CALL_SIGNATURES_H
 #define ZOA_EMIT_CALL_SIGNATURES_H
 
-#include "emit/used_temps.h"
+#include "support/pointer_table.h"
+
+#include <zoa/expr.h>
+#include <zoa/nesting.h>
 
 #include <zoa/enums.h>
 
@@ -84,10 +87,12 @@ public:
 
 private:
     void add(CALL* c);
+    void walk(TreeBase* n);
     std::map<std::string, CallSignature, std::less<>> signatures;
     std::vector<CALL*> misfitCalls;
     std::vector<CONST*> textPointers;
-    UsedMap seen;  // reused across units
+    PointerSet<const TreeBase*> met;  // calls and text constants met; reused across units
+    NestingGuard nesting;
 };
 
 }  // namespace ZOA
