@@ -37,15 +37,20 @@ std::string reportOf(const fuzz::CampaignOptions& o, const fuzz::CampaignStats& 
     return rep.str();
 }
 
-TEST(Fuzz, DifferentialCampaignAgreesWithGcc) {
-    fuzz::CampaignOptions o = campaign(fuzz::Mode::C, 1, 200);
-    o.batch = 100;
+// Runs o, expecting no failure and real comparisons (most calls have a C meaning).
+fuzz::CampaignStats runAgreeing(fuzz::CampaignOptions o) {
     std::ostringstream log;
     o.log = &log;
     fuzz::CampaignStats s = fuzz::runDifferential(o);
     EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
-    // The campaign must really compare: most calls have a C meaning.
     EXPECT_GT(s.callsCompared, 3 * s.seeds);
+    return s;
+}
+
+TEST(Fuzz, DifferentialCampaignAgreesWithGcc) {
+    fuzz::CampaignOptions o = campaign(fuzz::Mode::C, 1, 200);
+    o.batch = 100;
+    runAgreeing(o);
 }
 
 TEST(Fuzz, SoundProfileCampaignAgreesWithGcc) {
@@ -54,11 +59,7 @@ TEST(Fuzz, SoundProfileCampaignAgreesWithGcc) {
     fuzz::CampaignOptions o = campaign(fuzz::Mode::C, 1, 100);
     o.profile = Profile::SOUND;
     o.batch = 50;
-    std::ostringstream log;
-    o.log = &log;
-    fuzz::CampaignStats s = fuzz::runDifferential(o);
-    EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
-    EXPECT_GT(s.callsCompared, 3 * s.seeds);
+    fuzz::CampaignStats s = runAgreeing(o);
     // Each batch builds as one file at each level: units declaring one
     // function in two ways would each be rebuilt alone.
     EXPECT_EQ(s.programsBuilt, 4u);
@@ -80,25 +81,14 @@ TEST(Fuzz, SoundProfileCampaignAgreesWithGcc) {
 
 TEST(Fuzz, AssemblyCampaignAgreesWithTheInterpreter) {
     // The generated assembly subset is assembled, linked with a C driver and run.
-    fuzz::CampaignOptions o = campaign(fuzz::Mode::ASM, 1, 100);
-    std::ostringstream log;
-    o.log = &log;
-    fuzz::CampaignStats s = fuzz::runDifferential(o);
-    EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
-    EXPECT_GT(s.callsCompared, 3 * s.seeds);
-    EXPECT_EQ(s.programsBuilt, 1u);
+    EXPECT_EQ(runAgreeing(campaign(fuzz::Mode::ASM, 1, 100)).programsBuilt, 1u);
 }
 
 TEST(Fuzz, SoundAssemblyCampaignAgreesWithTheInterpreter) {
     // The C mode's units, written by the sound back end, each in a file of its own.
     fuzz::CampaignOptions o = campaign(fuzz::Mode::C, 1, 100);
     o.soundAsm = true;
-    std::ostringstream log;
-    o.log = &log;
-    fuzz::CampaignStats s = fuzz::runDifferential(o);
-    EXPECT_TRUE(s.failures.empty()) << reportOf(o, s) << log.str();
-    EXPECT_GT(s.callsCompared, 3 * s.seeds);
-    EXPECT_EQ(s.programsBuilt, 1u);
+    EXPECT_EQ(runAgreeing(o).programsBuilt, 1u);
 }
 
 TEST(Fuzz, AssemblyModeLeavesAByteRegisterFree) {
