@@ -123,7 +123,6 @@ private:
         }
         ref('L', o, ctx);
     }
-    void constant(CONST* c) { writeConstant(os, c); }
     void expr(ExprBase* e, int ctx);
     void exprBody(ExprBase* e, int ctx);
     void stmt(StmtBase* s, int ctx, int depth);
@@ -223,7 +222,7 @@ void Writer::expr(ExprBase* e, int ctx) {
 
 void Writer::exprBody(ExprBase* e, int ctx) {
     switch (e->getNodeType()) {
-        case CONST_NODE: constant(static_cast<CONST*>(e)); return;
+        case CONST_NODE: writeConstant(os, static_cast<CONST*>(e)); return;
         case BINOP_NODE: {
             BINOP* b = static_cast<BINOP*>(e);
             os << head(BINOP_NODE) << spell(b->getDataType()) << ' ' << spell(b->getOp()) << ' ';
@@ -389,7 +388,7 @@ void Writer::nameDef(NAME* n, int ctx) {
         privateData(n, ctx);
     } else if (n->getKind() == STATIC_DATA_REF && l.size() == 1 && l.front() && text.empty() &&
         l.front()->getNodeType() == CONST_NODE && l.front()->getDataType() == n->getDataType()) {
-        constant(static_cast<CONST*>(l.front()));
+        writeConstant(os, static_cast<CONST*>(l.front()));
     } else if (n->getKind() == CONST_ARRAY_REF && text.empty()) {
         os << "(values";
         for (ExprBase* e : l) {
@@ -409,7 +408,7 @@ void Writer::privateData(NAME* n, int ctx) {
     const ExprList& l = n->getList();
     if (n->getKind() == STATIC_DATA_REF && l.size() == 1 && l.front() && l.front()->getNodeType() == CONST_NODE) {
         os << "(static-data ";
-        constant(static_cast<CONST*>(l.front()));
+        writeConstant(os, static_cast<CONST*>(l.front()));
         os << ')';
     } else if (n->getZeroBytes()) {
         os << "(zero-data " << n->getZeroBytes() << ')';
